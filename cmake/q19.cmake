@@ -1,0 +1,42 @@
+# Helpers shared by the folders' CMakeLists.
+
+set(Q19_CORE_QT Qt6::Core Qt6::Sql Qt6::SerialPort Qt6::Network)
+set_property(GLOBAL PROPERTY Q19_CORE_LIBS "")
+
+# q19_core_library(<name> SOURCES ... [DEPENDS <core libs>...])
+# A static library of the core layer. It may link Qt's non-GUI modules and
+# other core libraries only; q19_check_core_layer() refuses anything else.
+function(q19_core_library name)
+  cmake_parse_arguments(ARG "" "" "SOURCES;DEPENDS" ${ARGN})
+  add_library(${name} STATIC ${ARG_SOURCES})
+  target_include_directories(${name} PUBLIC ${PROJECT_SOURCE_DIR}/src)
+  target_link_libraries(${name} PUBLIC ${Q19_CORE_QT} ${ARG_DEPENDS})
+  target_link_libraries(q19core INTERFACE ${name})
+  set_property(GLOBAL APPEND PROPERTY Q19_CORE_LIBS ${name})
+endfunction()
+
+# q19_add_test(<name> SOURCES ... LIBS ... [GUI])
+# A Qt Test executable registered with CTest. GUI tests run on the offscreen
+# platform so that they need no display.
+function(q19_add_test name)
+  cmake_parse_arguments(ARG "GUI" "" "SOURCES;LIBS" ${ARGN})
+  add_executable(${name} ${ARG_SOURCES})
+  target_link_libraries(${name} PRIVATE Qt6::Test ${ARG_LIBS})
+  add_test(NAME ${name} COMMAND ${name})
+  set(env "QT_QPA_PLATFORM=offscreen;Q19_TEST_SOURCE_DIR=${PROJECT_SOURCE_DIR}")
+  set_tests_properties(${name} PROPERTIES ENVIRONMENT "${env}" TIMEOUT 300)
+endfunction()
+
+# The core layer must never pull in the widget stack: engines are tested and
+# run headless, and q19ctl/q19sim run on machines without a display.
+function(q19_check_core_layer)
+  get_property(libs GLOBAL PROPERTY Q19_CORE_LIBS)
+  foreach(lib IN LISTS libs)
+    get_target_property(deps ${lib} LINK_LIBRARIES)
+    foreach(dep IN LISTS deps)
+      if(dep MATCHES "Widgets|PrintSupport|Qt6::Gui|QCustomPlot|q19gui")
+        message(FATAL_ERROR "core library ${lib} links ${dep}; the core layer must stay free of GUI modules")
+      endif()
+    endforeach()
+  endforeach()
+endfunction()
