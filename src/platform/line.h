@@ -47,6 +47,11 @@ public:
         Parity = 1009,
         TransmitFull = 1010,
         DcbError = 1011,
+        // Not a code of the communications control: the device went away
+        // under an open line (USB unplugged, pty master closed). The line is
+        // closed already when it is reported; the receive handler takes its
+        // "Unknown error or event" path, which ends the link.
+        LineLost = 9999,
     };
     Q_ENUM(EventCode)
 

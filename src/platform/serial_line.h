@@ -1,0 +1,69 @@
+#pragma once
+
+#include "platform/line.h"
+
+#include <QSerialPort>
+#include <QTimer>
+
+// The line over a serial device: /dev/ttyUSB0, /dev/ttyS0, a pseudo-terminal
+// /dev/pts/N, or COM3 on Windows.
+//
+// Port errors become the event codes of the communications control: a
+// write failure or time-out is 1010. Qt 6 no longer reports framing, parity
+// or break conditions, so 1004, 1009 and 1001 do not occur here; the receive
+// handler ignores those three anyway.
+// A device that goes away under the open line (USB unplugged, pty master
+// closed) closes the line and is reported as LineLost. Operations the device
+// does not support (DTR on a pty, 1.5 stop bits) are not events, and on a
+// pty, which has no wire, refused settings are not errors either.
+//
+// The port has no signal for its input pins, so while a real device is open
+// they are read every 200 ms and changes of CTS, DSR and CD become events 3,
+// 4 and 5, and a rising ring indicator event 6. Pseudo-terminals have no
+// pins and are not polled.
+class SerialLine : public Line {
+    Q_OBJECT
+public:
+    explicit SerialLine(QObject* parent = nullptr);
+    ~SerialLine() override;
+
+    void setPortName(const QString& name) override { m_portName = name; }
+    QString portName() const override { return m_portName; }
+    bool setSettings(const LineSettings& settings, QString* error = nullptr) override;
+    LineSettings settings() const override { return m_settings; }
+    void setHandshaking(Handshaking h) override;
+    Handshaking handshaking() const { return m_handshaking; }
+
+    bool open(QString* error = nullptr) override;
+    void close() override;
+    bool isOpen() const override { return m_port.isOpen(); }
+
+    bool write(const QByteArray& bytes) override;
+    void discardInput() override;
+
+    void setDtr(bool on) override;
+    bool dtr() const override { return m_dtr; }
+
+    // True while the open device is a pseudo-terminal.
+    bool isPseudoTerminal() const { return m_isPty; }
+
+    static constexpr int PinPollMs = 200;
+
+private:
+    void onReadyRead();
+    void onError(QSerialPort::SerialPortError error);
+    void pollPins();
+    bool applySettings(QString* error);
+    bool deviceGone() const;
+
+    QSerialPort m_port;
+    QTimer m_pinTimer;
+    QString m_portName;
+    LineSettings m_settings;
+    Handshaking m_handshaking = Handshaking::None;
+    // The communications control starts with DTR enabled, and a modem needs
+    // it to listen.
+    bool m_dtr = true;
+    bool m_isPty = false;
+    QSerialPort::PinoutSignals m_pins;
+};
