@@ -1,0 +1,336 @@
+#include "setpoints/instrument_schema.h"
+
+#include "setpoints/catalogue.h"
+
+#include <QFile>
+#include <QFileInfo>
+#include <functional>
+
+using catalogue::kChannels;
+using catalogue::kSetpointFields;
+
+namespace {
+
+using Type = Store::ColumnType;
+
+constexpr int kSpareField = 47;
+
+// Bank 1 starts with every temperature channel; the others are empty.
+constexpr int kChannelsInBank1 = 100;
+
+QString paddedDescription(int channel)
+{
+    return QStringLiteral("Ch %1").arg(channel).leftJustified(catalogue::kDescriptionLength, QLatin1Char(' '));
+}
+
+// Default of a field regardless of the row: the catalogue's, and 0 where
+// the catalogue names no value.
+QVariant fieldDefault(int field)
+{
+    const catalogue::FieldOwner owner = catalogue::findField(field);
+    if (owner.function)
+        return owner.function->defaultValue;
+    if (owner.untagged)
+        return owner.untagged->defaultValue;
+    return 0;
+}
+
+struct Limits {
+    QVariant min, max;
+};
+
+Limits fieldLimits(int field)
+{
+    switch (field) {
+    case catalogue::kLoadShedOrderField: return {0, kChannels};
+    case catalogue::kCompressorOrderField: return {0, catalogue::lastChannel(catalogue::Scope::Compressor)};
+    case catalogue::kCondenserOrderField: return {0, catalogue::lastChannel(catalogue::Scope::Condenser)};
+    default: break;
+    }
+    const catalogue::FieldOwner owner = catalogue::findField(field);
+    if (owner.function)
+        return {owner.function->min, owner.function->max};
+    return {0, 1}; // the check boxes' flags
+}
+
+QString infoColumnName(int ordinal)
+{
+    switch (ordinal) {
+    case kInfoName: return QStringLiteral("name");
+    case kInfoDefault: return QStringLiteral("default_value");
+    case kInfoField: return QStringLiteral("field");
+    case kInfoMinimum: return QStringLiteral("minimum");
+    case kInfoMaximum: return QStringLiteral("maximum");
+    case 7: return QStringLiteral("view_channel");
+    case 8: return QStringLiteral("graph");
+    case 9: return QStringLiteral("graph_caption");
+    case 11: return QStringLiteral("room_channel");
+    case 34: return QStringLiteral("brumalet_interval");
+    case 39: return QStringLiteral("report_heading");
+    case 40: return QStringLiteral("show_descriptions");
+    case 41: return QStringLiteral("connection");
+    case 42: return QStringLiteral("tab_name");
+    case 50: return QStringLiteral("kind_fore_colour");
+    case 51: return QStringLiteral("kind_back_colour");
+    default: break;
+    }
+    if (ordinal >= 12 && ordinal <= 31)
+        return QStringLiteral("room_probe_%1").arg(ordinal - 11, 2, 10, QLatin1Char('0'));
+    static const char* const pane[] = {"tab", "name", "in_use", "channel", "index", "colour", "room"};
+    if (ordinal >= 43 && ordinal <= 49)
+        return QStringLiteral("pane_") + QLatin1String(pane[ordinal - 43]);
+    if (ordinal >= 53 && ordinal <= 59)
+        return QStringLiteral("plant_pane_") + QLatin1String(pane[ordinal - 53]);
+    if (ordinal >= 62 && ordinal <= 65)
+        return QStringLiteral("plant_tag_%1").arg(ordinal - 54);
+    return QStringLiteral("spare_%1").arg(ordinal, 2, 10, QLatin1Char('0'));
+}
+
+// Columns that hold words: SQLite would otherwise turn "007" into 7.
+bool infoColumnIsText(int ordinal)
+{
+    switch (ordinal) {
+    case kInfoName:
+    case 9:
+    case 39:
+    case 41:
+    case 42:
+    case 44:
+    case 45:
+    case 46:
+    case 49:
+    case 54:
+    case 55:
+    case 56:
+    case 59:
+        return true;
+    default:
+        return false;
+    }
+}
+
+// Colours of the ten indicator kinds (blue, green, red order): fore, back.
+constexpr int kKindBack[10] = {65280, 65535, 255, 16711680, 16776960, 16711935, 33023, 12632256, 8421504, 16777215};
+
+bool fail(QString* error, const QString& message)
+{
+    if (error)
+        *error = message;
+    return false;
+}
+
+bool fillTable(Store& store, const QString& table, int rows, const std::function<QVariantList(int)>& rowValues,
+               QString* error)
+{
+    std::unique_ptr<Recordset> rs = store.openRecordset(table);
+    if (!rs)
+        return fail(error, store.lastError());
+    for (int row = 0; row < rows; ++row) {
+        if (!rs->AddNew())
+            return fail(error, rs->lastError());
+        const QVariantList values = rowValues(row);
+        for (int c = 0; c < values.size(); ++c) {
+            const QVariant& v = values.at(c);
+            if (v.isValid() && !rs->setValue(c, v))
+                return fail(error, rs->lastError());
+        }
+        if (!rs->Update())
+            return fail(error, rs->lastError());
+    }
+    return true;
+}
+
+} // namespace
+
+QStringList instrumentTables()
+{
+    return {kSetpointsTable, kInfoTable, kHistoryTable, kPowerTable, kAlarmLogTable};
+}
+
+QList<Store::Column> setpointsColumns()
+{
+    QList<Store::Column> columns;
+    for (int field = 0; field < kSetpointFields; ++field) {
+        const bool text = field == catalogue::kDescriptionField || field == catalogue::kChannelTextField;
+        columns.append({catalogue::fieldColumnName(field), text ? Type::Text : Type::Integer});
+    }
+    return columns;
+}
+
+QList<Store::Column> infoColumns()
+{
+    QList<Store::Column> columns;
+    for (int c = 0; c < kInfoColumns; ++c)
+        columns.append({infoColumnName(c), infoColumnIsText(c) ? Type::Text : Type::Integer});
+    return columns;
+}
+
+QList<Store::Column> historyColumns()
+{
+    // Channel values are "12.5" or -1000 alike; a numeric column keeps both as numbers.
+    QList<Store::Column> columns{{QStringLiteral("date"), Type::Text}, {QStringLiteral("time base"), Type::Integer}};
+    for (int ch = 1; ch <= kHistoryChannels; ++ch)
+        columns.append({QStringLiteral("Ch %1").arg(ch), Type::Integer});
+    return columns;
+}
+
+QList<Store::Column> powerColumns()
+{
+    return {{QStringLiteral("date"), Type::Text},
+            {QStringLiteral("time base"), Type::Integer},
+            {QStringLiteral("seconds"), Type::Integer},
+            {QStringLiteral("watts"), Type::Integer}};
+}
+
+QList<Store::Column> alarmLogColumns()
+{
+    return {{QStringLiteral("time"), Type::Text},
+            {QStringLiteral("channelnumber"), Type::Text},
+            {QStringLiteral("channeldiscription"), Type::Text},
+            {QStringLiteral("type"), Type::Text},
+            {QStringLiteral("value"), Type::Text}};
+}
+
+QList<InfoValidationRow> infoValidationRows()
+{
+    QList<InfoValidationRow> rows;
+    for (short field : catalogue::replyOrderFields()) {
+        if (field == catalogue::kDescriptionField) {
+            rows.append({catalogue::fieldLabel(field), QString(), field, {}, {}});
+            continue;
+        }
+        const Limits l = fieldLimits(field);
+        rows.append({catalogue::fieldLabel(field), fieldDefault(field), field, l.min, l.max});
+    }
+    // Fields that the upload checks without a row of their own.
+    for (int field = 223; field <= 227; ++field)
+        rows.append({catalogue::fieldLabel(field), 20, field, 0, 100});
+    rows.append({catalogue::fieldLabel(catalogue::kChannelNumberField), 1, catalogue::kChannelNumberField, 1, kChannels});
+    const catalogue::Function* anyNumber = catalogue::findFunction(31);
+    rows.append({catalogue::fieldLabel(kSpareField), 0, kSpareField, anyNumber->min, anyNumber->max});
+    Q_ASSERT(rows.size() == kInfoValidationRows);
+    return rows;
+}
+
+QVariant templateSetpoint(int row, int field)
+{
+    const int channel = row + 1;
+    switch (field) {
+    case catalogue::kChannelNumberField: return channel;
+    case catalogue::kChannelTextField: return QStringLiteral("Ch %1").arg(channel);
+    case catalogue::kDescriptionField: return paddedDescription(channel);
+    case catalogue::kCompressorOrderField:
+        return row < catalogue::lastChannel(catalogue::Scope::Compressor) ? channel : 0;
+    case catalogue::kCondenserOrderField:
+        return row < catalogue::lastChannel(catalogue::Scope::Condenser) ? channel : 0;
+    case 78: return kChannelsInBank1;
+    default: return fieldDefault(field);
+    }
+}
+
+QVariantList templateInfoRow(int row)
+{
+    QVariantList v(kInfoColumns);
+    static const QList<InfoValidationRow> validation = infoValidationRows();
+    if (row < validation.size()) {
+        const InfoValidationRow& r = validation.at(row);
+        v[kInfoName] = r.name;
+        v[kInfoDefault] = r.defaultValue;
+        v[kInfoField] = r.field;
+        v[kInfoMinimum] = r.minimum;
+        v[kInfoMaximum] = r.maximum;
+    }
+    if (row < 20) {
+        v[7] = 0;  // status display rows: empty
+        v[8] = 0;  // graph channels: none
+        v[9] = QString();
+        v[11] = 0; // room panels: none
+    }
+    if (row < 200) {
+        for (int c = 12; c <= 31; ++c)
+            v[c] = 0; // probes of a room: free
+        v[45] = QStringLiteral("0"); // pane rows free
+        v[55] = QStringLiteral("0");
+    }
+    if (row < 10) {
+        v[50] = 0;
+        v[51] = kKindBack[row];
+    }
+    if (row < 5)
+        v[42] = QStringLiteral("Not Set");
+    switch (row) {
+    case 0:
+        v[34] = 30; // seconds between Brumalet updates
+        v[39] = QStringLiteral("Company Name");
+        break;
+    case 1: v[39] = QString(); break;
+    case 2:
+        v[39] = QString();
+        v[40] = 1; // status view shows descriptions
+        v[kInfoConnectionColumn] = QStringLiteral("9600,n,8,1");
+        break;
+    case 3: v[kInfoConnectionColumn] = 1; break; // port 1
+    case 4:
+        v[40] = 0; // channel buttons show numbers
+        v[kInfoConnectionColumn] = 1; // direct
+        break;
+    case 5: v[kInfoConnectionColumn] = 0; break;
+    case 6: v[kInfoConnectionColumn] = QStringLiteral("ATZ"); break;
+    case 7: v[kInfoConnectionColumn] = 0; break; // no flow control
+    case kInfoTemperatureIntervalRow:
+    case kInfoPressureIntervalRow:
+        v[kInfoIntervalColumn] = 10;
+        v[8] = 0; // Data Points off
+        break;
+    case 31: v[8] = 1; break; // legend on
+    case 32:
+    case 33:
+    case 34:
+    case 37:
+    case 38:
+        v[8] = 0;
+        break;
+    case 35: v[8] = QStringLiteral("No Channel Selected "); break;
+    default: break;
+    }
+    return v;
+}
+
+bool createInstrumentTemplate(const QString& path, QString* error)
+{
+    if (QFileInfo::exists(path))
+        return fail(error, QStringLiteral("%1 already exists").arg(path));
+    std::unique_ptr<Store> store = Store::create(path, kInstrumentSchemaVersion, error);
+    if (!store)
+        return false;
+
+    QString why;
+    bool ok = false;
+    {
+        Store::Transaction tx(*store);
+        ok = store->createTable(kSetpointsTable, setpointsColumns())
+             && store->createTable(kInfoTable, infoColumns())
+             && store->createTable(kHistoryTable, historyColumns())
+             && store->createTable(kPowerTable, powerColumns())
+             && store->createTable(kAlarmLogTable, alarmLogColumns());
+        if (!ok)
+            why = store->lastError();
+        const auto setpointsRow = [](int row) {
+            QVariantList values;
+            for (int field = 0; field < kSetpointFields; ++field)
+                values.append(templateSetpoint(row, field));
+            return values;
+        };
+        ok = ok && fillTable(*store, kSetpointsTable, kChannels, setpointsRow, &why);
+        ok = ok && fillTable(*store, kInfoTable, kInfoRows, templateInfoRow, &why);
+        if (ok && !tx.commit()) {
+            ok = false;
+            why = store->lastError();
+        }
+    }
+    if (ok)
+        return true;
+    store.reset();
+    QFile::remove(path);
+    return fail(error, why.isEmpty() ? QStringLiteral("The data base could not be written") : why);
+}
