@@ -81,12 +81,18 @@ public:
     void setLastError(const QString& e) const { m_lastError = e; }
 
 private:
+    friend class Recordset;
     Store(QString path, QString connection);
     bool configure();
+    void requeryAll();
     QString m_path;
     QString m_connection;
     mutable QString m_lastError;
     int m_txDepth = 0;
+    // An inner scope rolled back: the outermost commit must not write.
+    bool m_txDoomed = false;
+    // Open record sets, detached when the store closes before them.
+    QList<Recordset*> m_recordsets;
 };
 
 // A record set in the manner the program's algorithms are written in: one
@@ -153,21 +159,34 @@ public:
 private:
     friend class Store;
     enum class Mode { None, Edit, AddNew };
-    Recordset(Store& store, QString table, QStringList fields, QString orderBy);
+    struct Statements;
+    Recordset(Store& store, QString table, QList<Store::Column> columns, QString orderBy);
     bool load();
     bool loadCurrent() const;
+    bool fetchRow(qint64 rowId, QVariantList* values) const;
+    bool writeRow(qint64 rowId, const QList<int>& ordinals, const QVariantList& stored);
+    bool hasCurrent() const;
+    void leaveEditing();
+    void moved();
+    void detach();
     bool fail(const QString& message) const;
 
-    Store& m_store;
+    Store* m_store; // null once the store has closed
+    std::unique_ptr<Statements> m_sql;
     QString m_table;
     QStringList m_fields;
+    QList<Store::ColumnType> m_types;
     QString m_orderBy;
     QList<qint64> m_rowIds;
     // -1 = BOF, RecordCount() = EOF.
     int m_pos = -1;
     bool m_deleted = false;
+    // Records were added to an empty set: BOF and EOF stay until the next move.
+    bool m_bothEnds = false;
     Mode m_mode = Mode::None;
+    // Values as written to the file, for the fields set since Edit/AddNew.
     QVariantList m_buffer;
+    QList<bool> m_dirty;
     mutable QVariantList m_current;
     mutable bool m_currentLoaded = false;
     mutable QString m_lastError;
