@@ -86,26 +86,31 @@ QString infoColumnName(int ordinal)
     return QStringLiteral("spare_%1").arg(ordinal, 2, 10, QLatin1Char('0'));
 }
 
-// Columns that hold words: SQLite would otherwise turn "007" into 7.
-bool infoColumnIsText(int ordinal)
+// The store turns what an Integer column is given into a whole number and
+// refuses words, so every column that may hold a word, a decimal or a mix of
+// both (the graph settings of column 8) is Text; the others read back as numbers.
+bool infoColumnIsNumeric(int ordinal)
 {
     switch (ordinal) {
-    case kInfoName:
-    case 9:
-    case 39:
-    case 41:
-    case 42:
-    case 44:
-    case 45:
-    case 46:
-    case 49:
-    case 54:
-    case 55:
-    case 56:
-    case 59:
+    case kInfoDefault:
+    case kInfoField:
+    case kInfoMinimum:
+    case kInfoMaximum:
+    case 7:
+    case 11:
+    case 34:
+    case 40:
+    case 43:
+    case 47:
+    case 48:
+    case 50:
+    case 51:
+    case 53:
+    case 57:
+    case 58:
         return true;
     default:
-        return false;
+        return ordinal >= 12 && ordinal <= 31;
     }
 }
 
@@ -161,16 +166,16 @@ QList<Store::Column> infoColumns()
 {
     QList<Store::Column> columns;
     for (int c = 0; c < kInfoColumns; ++c)
-        columns.append({infoColumnName(c), infoColumnIsText(c) ? Type::Text : Type::Integer});
+        columns.append({infoColumnName(c), infoColumnIsNumeric(c) ? Type::Integer : Type::Text});
     return columns;
 }
 
 QList<Store::Column> historyColumns()
 {
-    // Channel values are "12.5" or -1000 alike; a numeric column keeps both as numbers.
+    // Channel values are "12.5" or -1000 alike: both read back as numbers.
     QList<Store::Column> columns{{QStringLiteral("date"), Type::Text}, {QStringLiteral("time base"), Type::Integer}};
     for (int ch = 1; ch <= kHistoryChannels; ++ch)
-        columns.append({QStringLiteral("Ch %1").arg(ch), Type::Integer});
+        columns.append({QStringLiteral("Ch %1").arg(ch), Type::Double});
     return columns;
 }
 
@@ -179,7 +184,7 @@ QList<Store::Column> powerColumns()
     return {{QStringLiteral("date"), Type::Text},
             {QStringLiteral("time base"), Type::Integer},
             {QStringLiteral("seconds"), Type::Integer},
-            {QStringLiteral("watts"), Type::Integer}};
+            {QStringLiteral("watts"), Type::Double}};
 }
 
 QList<Store::Column> alarmLogColumns()
@@ -196,7 +201,7 @@ QList<InfoValidationRow> infoValidationRows()
     QList<InfoValidationRow> rows;
     for (short field : catalogue::replyOrderFields()) {
         if (field == catalogue::kDescriptionField) {
-            rows.append({catalogue::fieldLabel(field), QString(), field, {}, {}});
+            rows.append({catalogue::fieldLabel(field), {}, field, {}, {}});
             continue;
         }
         const Limits l = fieldLimits(field);
@@ -331,6 +336,7 @@ bool createInstrumentTemplate(const QString& path, QString* error)
     if (ok)
         return true;
     store.reset();
-    QFile::remove(path);
+    for (const char* suffix : {"", "-wal", "-shm", "-journal"})
+        QFile::remove(path + QLatin1String(suffix));
     return fail(error, why.isEmpty() ? QStringLiteral("The data base could not be written") : why);
 }
