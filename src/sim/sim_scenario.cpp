@@ -1,0 +1,156 @@
+#include "sim/sim_instrument.h"
+
+#include <QStringList>
+
+namespace sim {
+
+namespace {
+
+// "F:3,5" -> kind F, ordinals 3 and 5.
+bool parseNth(const QString& value, QHash<QByteArray, QSet<int>>& into)
+{
+    const int colon = value.indexOf(QLatin1Char(':'));
+    if (colon <= 0)
+        return false;
+    const QByteArray kind = value.left(colon).trimmed().toLatin1();
+    QSet<int> set;
+    for (const QString& part : value.mid(colon + 1).split(QLatin1Char(','), Qt::SkipEmptyParts)) {
+        bool ok = false;
+        const int n = part.trimmed().toInt(&ok);
+        if (!ok || n < 1)
+            return false;
+        set.insert(n);
+    }
+    into[kind].unite(set);
+    return true;
+}
+
+QByteArray dialResult(QString word)
+{
+    word = word.trimmed().toUpper().remove(QLatin1Char(' ')).remove(QLatin1Char('_'));
+    if (word == QLatin1String("CONNECT"))
+        return "CONNECT";
+    if (word == QLatin1String("BUSY"))
+        return "BUSY";
+    if (word == QLatin1String("NOCARRIER"))
+        return "NO CARRIER";
+    if (word == QLatin1String("NODIALTONE"))
+        return "NO DIALTONE";
+    return {};
+}
+
+} // namespace
+
+QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
+{
+    QString line = rawLine.trimmed();
+    if (line.isEmpty() || line.startsWith(QLatin1Char('#')))
+        return {};
+    QString key, value;
+    const int eq = line.indexOf(QLatin1Char('='));
+    if (eq >= 0) {
+        key = line.left(eq).trimmed();
+        value = line.mid(eq + 1).trimmed();
+    } else {
+        const int sp = line.indexOf(QLatin1Char(' '));
+        key = sp < 0 ? line : line.left(sp);
+        value = sp < 0 ? QString() : line.mid(sp + 1).trimmed();
+    }
+    key = key.toLower().replace(QLatin1Char('-'), QLatin1Char('_'));
+    Faults& f = instrument.faults();
+    bool ok = true;
+    auto number = [&]() { return value.toInt(&ok); };
+    auto flag = [&]() { return value.isEmpty() || value == QLatin1String("1") || value.toLower() == QLatin1String("on") || value.toLower() == QLatin1String("yes"); };
+
+    if (key == QLatin1String("version")) {
+        if (value.isEmpty())
+            ok = false;
+        else
+            instrument.state().setVersion(value.toLatin1());
+    } else if (key == QLatin1String("id")) {
+        const int n = number();
+        if (ok)
+            instrument.settings().id = n;
+    } else if (key == QLatin1String("resets")) {
+        const int n = number();
+        if (ok)
+            instrument.state().setResets(n);
+    } else if (key == QLatin1String("speed")) {
+        const double s = value.toDouble(&ok);
+        if (ok && s > 0)
+            instrument.settings().speed = s;
+        else
+            ok = false;
+    } else if (key == QLatin1String("dial")) {
+        QList<QByteArray> results;
+        for (const QString& w : value.split(QLatin1Char(','), Qt::SkipEmptyParts)) {
+            const QByteArray r = dialResult(w);
+            if (r.isEmpty())
+                return QStringLiteral("error: unknown dial result '%1'").arg(w.trimmed());
+            results << r;
+        }
+        if (results.isEmpty())
+            ok = false;
+        else
+            f.dial = results;
+    } else if (key == QLatin1String("drop")) {
+        ok = parseNth(value, f.drop);
+    } else if (key == QLatin1String("garble")) {
+        ok = parseNth(value, f.garble);
+    } else if (key == QLatin1String("delay")) {
+        const int n = number();
+        if (ok)
+            f.delayMs = qMax(0, n);
+    } else if (key == QLatin1String("batch")) {
+        const QStringList p = value.split(QLatin1Char(':'));
+        f.batchBytes = p.value(0).toInt(&ok);
+        if (ok && p.size() > 1)
+            f.batchGapMs = p.value(1).toInt(&ok);
+    } else if (key == QLatin1String("nocomp")) {
+        f.nocomp = flag();
+    } else if (key == QLatin1String("wrong_id")) {
+        if (value.toLower() == QLatin1String("off"))
+            f.wrongId.reset();
+        else {
+            const int n = number();
+            if (ok)
+                f.wrongId = n;
+        }
+    } else if (key == QLatin1String("wrong_version")) {
+        if (value.toLower() == QLatin1String("off"))
+            f.wrongVersion.reset();
+        else if (value.isEmpty())
+            ok = false;
+        else
+            f.wrongVersion = value.toLatin1();
+    } else if (key == QLatin1String("brumalet_delay")) {
+        const int n = number();
+        if (ok)
+            instrument.settings().brumaletDelayMs = qMax(0, n);
+    } else if (key == QLatin1String("clear_faults")) {
+        f = Faults();
+    } else if (key == QLatin1String("reset")) {
+        instrument.reset();
+    } else if (key == QLatin1String("drop_line")) {
+        instrument.dropLine(value.isEmpty() ? 10000 : number());
+    } else if (key == QLatin1String("alarm")) {
+        const int ch = number();
+        if (ok && ch >= 1 && ch <= 264)
+            instrument.state().raiseAlarm(ch);
+        else
+            ok = false;
+    } else if (key == QLatin1String("torvanel_alarm")) {
+        const QStringList p = value.split(QLatin1Char(':'));
+        bool ok2 = false;
+        const int s = p.value(0).toInt(&ok);
+        const int i = p.value(1).toInt(&ok2);
+        ok = ok && ok2 && p.size() >= 2;
+        if (ok)
+            instrument.state().setTorvanelAlarm(s, i, p.value(2, QStringLiteral("1")) != QLatin1String("0"));
+    } else {
+        return QStringLiteral("error: unknown key '%1'").arg(key);
+    }
+    return ok ? QString() : QStringLiteral("error: bad value for %1: '%2'").arg(key, value);
+}
+
+} // namespace sim

@@ -1,0 +1,194 @@
+#pragma once
+
+#include "sim/sim_catalogue.h"
+
+#include <QByteArray>
+#include <QDateTime>
+#include <QList>
+#include <QRandomGenerator>
+#include <QVector>
+
+#include <array>
+
+namespace sim {
+
+// Special readings of an input, as every reply carries them.
+enum Special { NotConnected = -1000, OverRange = -1001, NoSensor = -1002, Unused1003 = -1003, LoadShed = -1004 };
+
+struct AlarmRecord {
+    int channel = 0; // 1..264: 1-200 rooms, 201-215 pressures, 216 liquid level, 217-264 digital
+    QByteArray description;
+    int kind = 0; // 1 high, 2 low
+    QDateTime time;
+    int value = 0;
+};
+
+struct HistoryRecord {
+    QDateTime time;
+    QVector<int> values; // 216 entries; a channel not logged holds NotLogged
+    static constexpr int NotLogged = -99999;
+};
+
+struct PowerRecord {
+    QDateTime end;
+    int seconds = 900;
+    int watts = 0;
+};
+
+// A log of the instrument: a ring of the last capacity records and the
+// mark of what has already gone up the line.
+template <typename T>
+struct Log {
+    QList<T> records;
+    int firstNew = 0;
+    int capacity = 500;
+    qint64 dropped = 0; // records that fell off the front, ever
+    void add(const T& r)
+    {
+        records.append(r);
+        while (records.size() > capacity) {
+            records.removeFirst();
+            firstNew = qMax(0, firstNew - 1);
+            ++dropped;
+        }
+    }
+    void clear()
+    {
+        dropped += records.size();
+        records.clear();
+        firstNew = 0;
+    }
+    // Everything up to end (counted as dropped + index) has gone up the line.
+    void markSent(qint64 end) { firstNew = int(qBound<qint64>(firstNew, end - dropped, records.size())); }
+    int newCount() const { return int(records.size()) - firstNew; }
+};
+
+struct RoomState {
+    double value = 0;    // tenths, or the channel's unit
+    int special = 0;     // 0, or one of Special
+    bool alarm = false;
+    double highFor = 0;  // seconds above the high limit
+    double lowFor = 0;
+    bool liquid = false, fan = false, defrost = false, suction = false;
+    double defrostLeft = 0; // seconds
+    int pidPercent = 0;
+    int fanPercent = 0;
+};
+
+struct Compressor {
+    int units = 0;     // capacity units it has
+    int running = 0;   // units running
+    double hours = 0;
+    bool equalizer = false;
+};
+
+struct Condenser {
+    int stages = 0; // 1..4, or 64 steps when variable
+    int running = 0;
+    double hours = 0;
+};
+
+struct Options {
+    QByteArray version = "9.6";
+    int id = 1;
+    int resets = 0;
+    quint32 seed = 1;
+    int alarmCapacity = 200;
+    int historyCapacity = 1000;
+    int powerCapacity = 2000;
+    QDateTime start;     // instrument clock at start; invalid: now
+    int historyHours = 24; // plant run before start, to fill the logs
+};
+
+// The instrument's memory and its plant. Time moves only by advance(), in
+// plant milliseconds, so that tests and the --speed option drive it alike.
+class InstrumentState {
+public:
+    explicit InstrumentState(const Options& options = {});
+
+    const Options& options() const { return m_options; }
+    QByteArray version() const { return m_version; }
+    void setVersion(const QByteArray& v) { m_version = v; }
+    double versionNumber() const { return sim::versionNumber(m_version); }
+    int resets() const { return m_resets; }
+    void countReset() { ++m_resets; }
+    void setResets(int n) { m_resets = n; }
+
+    QDateTime now() const { return m_now; }
+    void advance(qint64 ms);
+
+    // The set point table, row by wire channel.
+    int field(int wire, int field) const { return m_sp[wire][field]; }
+    void setField(int wire, int field, int value) { m_sp[wire][field] = value; }
+    QByteArray description(int wire) const { return m_desc[wire]; }
+    void setDescription(int wire, const QByteArray& d);
+
+    // Takes a write as the "P" command carries it: the comma separated parts
+    // behind "P" (function, channel, sub-function, width flag, value, group
+    // size, further values), or a whole order for functions 65, 90 and 100.
+    // False when the instrument has no such function for that channel or a
+    // value is not a number.
+    bool applyWrite(const QList<QByteArray>& parts);
+
+    const RoomState& room(int channel) const { return m_rooms[channel - 1]; } // 1..216
+    // The reading of a channel as the replies carry it: value or special.
+    int reading(int channel) const;
+    int banks() const { return qBound(1, m_sp[0][83], 5); }
+    int suctionPressure(int bank) const { return int(m_suction[bank]); }
+    int dischargePressure(int bank) const { return int(m_discharge[bank]); }
+    int liquidPressure(int bank) const { return int(m_discharge[bank]) - 60; }
+    bool liquidPump(int bank) const;
+    int liquidLevel() const { return int(m_level); }
+    const Compressor& compressor(int i) const { return m_comp[i]; }
+    const Condenser& condenser(int i) const { return m_cond[i]; }
+    int compressorCount() const;
+    int condenserCount() const;
+    bool torvanelAlarm(int s, int i) const;
+    void setTorvanelAlarm(int s, int i, bool on);
+
+    Log<AlarmRecord> alarms;
+    Log<HistoryRecord> history;
+    Log<PowerRecord> power;
+
+    // Active alarms cleared; true when there were any, or any logged.
+    bool clearAlarms();
+    // An alarm raised by hand (control channel), logged like any other.
+    void raiseAlarm(int channel);
+    // Set when the plant logs an alarm; the line layer announces it.
+    bool takeNewAlarm();
+
+    // Brumalet scanners: channel -> kind (1 standard, 2 E).
+    int brumaletKind(int channel) const;
+
+private:
+    void seed();
+    void step(double seconds);
+    void minuteEvents();
+    void logAlarm(int channel, int kind, int value);
+    int activeSetPoint(int row) const;
+    void stepPlantRoom(double dt);
+    double noise(double amplitude);
+
+    Options m_options;
+    QByteArray m_version;
+    int m_resets = 0;
+    QRandomGenerator m_rng;
+    QDateTime m_now;
+    qint64 m_carryMs = 0;
+    std::array<std::array<int, Fields>, Channels> m_sp {};
+    std::array<QByteArray, Channels> m_desc;
+    std::array<RoomState, Channels> m_rooms;
+    double m_suction[5] = {};
+    double m_discharge[5] = {};
+    double m_level = 60;
+    double m_stageClock[5] = {};
+    double m_condClock[5] = {};
+    std::array<Compressor, 27> m_comp;
+    std::array<Condenser, 12> m_cond;
+    std::array<std::array<bool, 41>, 27> m_torvanel {};
+    double m_energy = 0; // watt seconds of the running quarter hour
+    double m_quarterSeconds = 0;
+    bool m_newAlarm = false;
+};
+
+} // namespace sim
