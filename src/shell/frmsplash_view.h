@@ -1,0 +1,14 @@
+#pragma once
+
+#include <QWidget>
+
+class QLabel;
+
+// The window shown while the connection form loads its directory and the
+// selected instrument's data base.
+class frmSplash : public QWidget {
+    Q_OBJECT
+public:
+    explicit frmSplash(QWidget* parent = nullptr);
+    QLabel* lblVersion = nullptr;
+};

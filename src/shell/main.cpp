@@ -1,0 +1,111 @@
+#include "directory/data_folder.h"
+#include "directory/directory_engine.h"
+#include "link/ccform1_engine.h"
+#include "link/link_globals.h"
+#include "link/open_views.h"
+#include "platform/clock.h"
+#include "platform/line_factory.h"
+#include "platform/settings.h"
+#include "platform/widget_operator.h"
+#include "shell/app_version.h"
+#include "shell/builtin_simulator_line.h"
+#include "shell/ccform1_view.h"
+#include "shell/frmsplash_view.h"
+#include "shell/mdiform1_view.h"
+#include "shell/widget_icons.h"
+
+#include <QApplication>
+#include <QCommandLineParser>
+#include <QDir>
+#include <QMessageBox>
+#include <QStandardPaths>
+
+namespace {
+
+// The demo keeps its own folder, so that trying the program never touches
+// the operator's real directory of instruments.
+QString demoFolder()
+{
+    return QStandardPaths::writableLocation(QStandardPaths::GenericDataLocation) + QStringLiteral("/q19-demo");
+}
+
+} // namespace
+
+int main(int argc, char* argv[])
+{
+    QApplication app(argc, argv);
+    QApplication::setOrganizationName(QStringLiteral("Glacinor"));
+    QApplication::setOrganizationDomain(QStringLiteral("glacinor.invalid"));
+    QApplication::setApplicationName(QStringLiteral("q19"));
+    QApplication::setApplicationDisplayName(QStringLiteral("Glacinor Q-19"));
+    QApplication::setApplicationVersion(appVersionText().mid(8));
+    QApplication::setWindowIcon(q19Icon(QStringLiteral("app")));
+
+    QCommandLineParser parser;
+    parser.setApplicationDescription(QStringLiteral("Operator's workstation for the Glacinor Model Q-19."));
+    parser.addHelpOption();
+    parser.addVersionOption();
+    const QCommandLineOption demo(QStringLiteral("demo"),
+                                  QStringLiteral("Open the demo data folder, whose instrument is the built-in simulator."));
+    const QCommandLineOption dataDir(QStringLiteral("data-dir"), QStringLiteral("Use DIR as the data folder."),
+                                     QStringLiteral("DIR"));
+    parser.addOption(demo);
+    parser.addOption(dataDir);
+    parser.process(app);
+
+    const QString folderPath = parser.isSet(dataDir) ? parser.value(dataDir)
+                               : parser.isSet(demo)  ? demoFolder()
+                                                     : DataFolder::location();
+    DataFolder folder(folderPath);
+
+    auto* splash = new frmSplash;
+    splash->show();
+    app.processEvents();
+
+    QString error;
+    if (!folder.ensure(&error)) {
+        splash->close();
+        QMessageBox::critical(nullptr, QStringLiteral("Glacinor Q-19"),
+                              QStringLiteral("The data folder %1 cannot be used:\n%2").arg(folderPath, error));
+        return 1;
+    }
+
+    SystemClock clock;
+    WidgetOperator op;
+    QtSettings settings;
+    OpenViews views;
+    LinkGlobals globals;
+
+    MDIForm1 mainWindow(views, globals);
+    op.setParentWidget(&mainWindow);
+
+    ccForm1_engine* lineEngine = nullptr;
+    auto lineFactory = [&lineEngine](const QString& port) -> std::unique_ptr<Line> {
+        if (port == BuiltinSimulatorLine::PortName) {
+            return std::make_unique<BuiltinSimulatorLine>([&lineEngine] {
+                return lineEngine && lineEngine->Option2[0].value.toBool();
+            });
+        }
+        return makeLine(port);
+    };
+    ccForm1_engine line(clock, op, settings, views, globals, lineFactory);
+    lineEngine = &line;
+    ccForm1_directory directory(folder, op);
+    QObject::connect(&directory, &ccForm1_directory::instrumentSelected, &line, &ccForm1_engine::setInstrument);
+    QObject::connect(&directory, &ccForm1_directory::propertySettingsWanted, &line,
+                     &ccForm1_engine::LoadPropertySettings);
+
+    mainWindow.engine().setLink(&line);
+    mainWindow.engine().MDIForm_Load();
+    if (!directory.Form_Load()) {
+        splash->close();
+        return 1;
+    }
+    mainWindow.setConnectionForm(new ccForm1_view(directory, line));
+
+    splash->close();
+    mainWindow.showMaximized();
+    const int rc = app.exec();
+    directory.Form_Unload();
+    return rc;
+}
