@@ -1,0 +1,626 @@
+#include "link/ccform1_engine.h"
+#include "link/commands.h"
+#include "platform/fake_line.h"
+#include "platform/manual_clock.h"
+
+#include <QtTest>
+
+namespace {
+
+// Every role a view can play, recording the calls the dispatcher makes.
+struct Views : ChannelsView, HistoryView, PowerView, TemperatureStatusView, PressureStatusView,
+               PressureGraphicView, AlarmView, FrontView, BrumaletView, ShellView {
+    QStringList calls;
+    bool cycleRunning = false;
+    OpenViews* table = nullptr;
+    QString who; // which status view a status_do call is for
+    void ret_handel() override { calls << "ret_handel"; }
+    void sin_chan_up_load() override { calls << "sin_chan_up_load"; }
+    void down_check() override { calls << "down_check"; }
+    void done_down() override { calls << "done_down"; }
+    void stopTimer5() override { calls << "channels.Timer5"; }
+    void stopTimer3() override { calls << "Timer3"; }
+    void history_do() override { calls << "history_do"; }
+    void power_do() override { calls << "power_do"; }
+    bool stopstatusEnabled() const override { return cycleRunning; }
+    void stopstatus_Click() override { calls << "stopstatus_Click"; }
+    void status_do() override { calls << "status_do"; }
+    void statusp_do() override { calls << "statusp_do"; }
+    void statuspa_do() override { calls << "statuspa_do"; }
+    void statuspg_do() override { calls << "statuspg_do"; }
+    void alarm_do(const QString& d) override { calls << "alarm_do:" + d; }
+    void uploadnew_Click() override { calls << "uploadnew_Click"; }
+    void stopTimer2() override { calls << "alarm.Timer2"; }
+    void showMaximised() override { calls << "showMaximised"; }
+    void Front_do(const QString&) override { calls << "Front_do"; }
+    void start_do(const QString&) override { calls << "start_do"; }
+    void status_do(const QString&) override { calls << "brumalet.status_do"; }
+    void mnualarmon_Click() override
+    {
+        calls << "mnualarmon_Click";
+        table->alarm_open = true;
+    }
+    void mnualloff_Click() override { calls << "mnualloff_Click"; }
+    void setToolbarEnabled(bool) override { calls << "Toolbar1"; }
+    void unloadUploadProgress() override { calls << "unload upload"; }
+};
+
+// Flags of the open views, for data rows.
+enum Open {
+    History = 1, Alarm = 2, Status = 4, Channels = 8, StatusP = 16, Power = 32, LoadShed = 64,
+    StatusG = 128, StatusPG = 256, Front = 512, Brumalet = 1024, MultiProbes = 2048,
+};
+
+struct Rig {
+    ManualClock clock;
+    ScriptedOperator op;
+    MemorySettings settings;
+    OpenViews table;
+    LinkGlobals globals;
+    Views views;
+    FakeLine* line = nullptr;
+    int linesMade = 0;
+    std::unique_ptr<ccForm1_engine> engine;
+
+    explicit Rig(bool direct = true)
+    {
+        views.table = &table;
+        table.history = &views;
+        table.power = &views;
+        table.alarm = &views;
+        table.channels = &views;
+        table.loadshed = static_cast<ChannelsView*>(&views);
+        table.status = table.statusg = table.multiprobes = &views;
+        table.statusp = &views;
+        table.statuspg = &views;
+        table.front = &views;
+        table.brumalet = &views;
+        table.shell = &views;
+        engine = std::make_unique<ccForm1_engine>(
+            clock, op, settings, table, globals, [this](const QString& name) {
+                auto l = std::make_unique<FakeLine>();
+                l->setPortName(name);
+                line = l.get();
+                ++linesMade;
+                return std::unique_ptr<Line>(std::move(l));
+            });
+        engine->setInstrument(QStringLiteral("12"), QStringLiteral("5551234"), nullptr);
+        engine->Option2_Click(direct ? 1 : 0);
+    }
+    void open(int mask)
+    {
+        table.history_open = mask & History;
+        table.alarm_open = mask & Alarm;
+        table.status_open = mask & Status;
+        table.channels_open = mask & Channels;
+        table.statusp_open = mask & StatusP;
+        table.power_open = mask & Power;
+        table.loadshed_open = mask & LoadShed;
+        table.statusg_open = mask & StatusG;
+        table.statuspg_open = mask & StatusPG;
+        table.front_open = mask & Front;
+        table.brumalet_open = mask & Brumalet;
+        table.multiprobes_open = mask & MultiProbes;
+    }
+    // A modem call that the modem has answered with CONNECT.
+    void dialAndConnect()
+    {
+        engine->dial_num_Click();
+        line->deliver("\r\nCONNECT 9600\r\n");
+    }
+};
+
+QByteArray identity(const QByteArray& version, const QByteArray& id)
+{
+    return version.leftJustified(7, ' ') + id + "00003" + "05/01/2026 08:00:00   " + "Glacinor";
+}
+
+} // namespace
+
+class TestCcForm1Engine : public QObject {
+    Q_OBJECT
+private slots:
+    void dispatch_data();
+    void dispatch();
+    void busyWinsOverConnect();
+    void connectFallsThroughWithoutModemPort();
+    void modemConnectSendsKThenWaitsForIdentity();
+    void filter_data();
+    void filter();
+    void trimBeforeNextArrival_data();
+    void trimBeforeNextArrival();
+    void identityCheck_data();
+    void identityCheck();
+    void fiveTriesThenNoGlacinor();
+    void resetIgnoredWhileConnecting();
+    void resetOnEstablishedLine();
+    void command6SendsNothing();
+    void hangUpSleeps_data();
+    void hangUpSleeps();
+    void busyRedialsWithoutLimit();
+    void silentInstrumentRedialsUnderTheMessage();
+    void commsErrorSameStateForBothAnswers();
+    void eventMessageHidesErrors();
+    void modemTestLeavesLinkUp();
+    void baudRateRule_data();
+    void baudRateRule();
+    void connectionTypeRefusedWithPortOpen();
+    void newAlarm_data();
+    void newAlarm();
+    void openFailureNamesTheReason();
+    void portChangeMakesNewLine();
+};
+
+void TestCcForm1Engine::dispatch_data()
+{
+    QTest::addColumn<QByteArray>("reply");
+    QTest::addColumn<int>("open");
+    QTest::addColumn<QString>("version");
+    QTest::addColumn<QStringList>("calls");
+    QTest::addColumn<bool>("cleared");
+
+    QTest::newRow("sret, no view: no hit, text stays") << QByteArray("1,2,sret") << 0 << "9.6"
+                                                        << QStringList{} << false;
+    QTest::newRow("sret to load shed") << QByteArray("1,2,sret") << int(LoadShed) << "9.6"
+                                       << QStringList{"ret_handel"} << true;
+    QTest::newRow("sret to channels first") << QByteArray("1,2,sret") << int(Channels | LoadShed)
+                                            << "9.6" << QStringList{"ret_handel"} << true;
+    QTest::newRow("status: statusg before multiprobes")
+        << QByteArray("  1  2status") << int(StatusG | MultiProbes) << "9.6"
+        << QStringList{"status_do"} << true;
+    QTest::newRow("status: no view, dropped") << QByteArray("status") << 0 << "9.6" << QStringList{}
+                                              << true;
+    QTest::newRow("histy with view closed is dropped") << QByteArray("x histy") << 0 << "9.6"
+                                                       << QStringList{} << true;
+    QTest::newRow("histy before status in a payload")
+        << QByteArray("status histy") << int(History | Status) << "9.6"
+        << QStringList{"history_do"} << true;
+    QTest::newRow("tempfront with front closed stays") << QByteArray("tempfront") << 0 << "9.6"
+                                                       << QStringList{} << false;
+    QTest::newRow("dxstart with brumalet closed stays") << QByteArray("dxstart") << 0 << "9.6"
+                                                        << QStringList{} << false;
+    QTest::newRow("evapfrst to brumalet") << QByteArray("evapfrst") << int(Brumalet) << "9.6"
+                                          << QStringList{"brumalet.status_do"} << true;
+    QTest::newRow("torvan below version 8 dropped") << QByteArray("torvan") << int(StatusP) << "7.9"
+                                                    << QStringList{} << true;
+    QTest::newRow("torvan at 8") << QByteArray("torvan") << int(StatusP) << " 8"
+                                 << QStringList{"statuspa_do"} << true;
+    QTest::newRow("presss to statuspg") << QByteArray("presss") << int(StatusPG) << "9.6"
+                                        << QStringList{"statuspg_do"} << true;
+    QTest::newRow("almlog copies the buffer") << QByteArray("a\rb almlog") << int(Alarm) << "9.6"
+                                              << QStringList{"alarm_do:a\r\nb almlog"} << true;
+    QTest::newRow("dlres stops the data log timer") << QByteArray("dlres") << 0 << "9.6"
+                                                    << QStringList{"Timer3"} << true;
+    QTest::newRow("schanupload before status") << QByteArray("status schanupload")
+                                               << int(Channels | Status) << "9.6"
+                                               << QStringList{"sin_chan_up_load"} << true;
+    QTest::newRow("no token: text waits") << QByteArray("Glacino") << int(Status) << "9.6"
+                                          << QStringList{} << false;
+}
+
+void TestCcForm1Engine::dispatch()
+{
+    QFETCH(QByteArray, reply);
+    QFETCH(int, open);
+    QFETCH(QString, version);
+    QFETCH(QStringList, calls);
+    QFETCH(bool, cleared);
+    Rig rig;
+    rig.open(open);
+    rig.globals.instrument_version = version;
+    rig.line->deliver(reply);
+    QCOMPARE(rig.views.calls, calls);
+    QCOMPARE(rig.engine->test3.isEmpty(), cleared);
+}
+
+void TestCcForm1Engine::busyWinsOverConnect()
+{
+    Rig rig(false);
+    rig.engine->dial_num_Click();
+    rig.line->deliver("CONNECT\r\nBUSY\r\n");
+    QCOMPARE(rig.op.titles(), QStringList{"Busy"});
+    QVERIFY(!rig.globals.modem_online);
+    QVERIFY(rig.engine->Timer2.Enabled());
+    QVERIFY(!rig.engine->Timer9.Enabled());
+}
+
+void TestCcForm1Engine::connectFallsThroughWithoutModemPort()
+{
+    Rig rig(false);
+    rig.line->deliver("CONNECT 9600");
+    QVERIFY(!rig.engine->Timer9.Enabled());
+    QVERIFY(!rig.globals.modem_online);
+    QCOMPARE(rig.engine->test3, QStringLiteral("CONNECT 9600"));
+}
+
+void TestCcForm1Engine::modemConnectSendsKThenWaitsForIdentity()
+{
+    Rig rig(false);
+    rig.dialAndConnect();
+    QCOMPARE(rig.line->writes().first(), QByteArray("ATX4DT5551234\r\n"));
+    QVERIFY(rig.globals.modem_online);
+    rig.clock.advance(1999);
+    QCOMPARE(rig.line->writes().size(), 1);
+    rig.clock.advance(1);
+    QCOMPARE(rig.line->lastWrite(), QByteArray("K"));
+    QCOMPARE(rig.clock.remaining(&rig.engine->Timer4), 38000);
+    rig.line->deliver(identity("9.6", "00012"));
+    QVERIFY(!rig.engine->Timer4.Enabled());
+    QCOMPARE(rig.engine->Text3[4].text, QStringLiteral("ID No. 12"));
+    QVERIFY(rig.op.messages().isEmpty());
+}
+
+void TestCcForm1Engine::filter_data()
+{
+    QTest::addColumn<QString>("box");
+    QTest::addColumn<QByteArray>("data");
+    QTest::addColumn<QString>("expected");
+    QTest::newRow("leading backspace replaces the box's last") << "abc" << QByteArray("\bX") << "abX";
+    QTest::newRow("inner backspace takes the one before") << "abc" << QByteArray("d\be") << "abce";
+    QTest::newRow("two leading backspaces take one") << "abc" << QByteArray("\b\bZ") << "abZ";
+    QTest::newRow("line feeds go, CR gets LF") << "" << QByteArray("a\n\rb\r\n") << "a\r\nb\r\n";
+    QTest::newRow("backspace on an empty box") << "" << QByteArray("\bq") << "q";
+}
+
+void TestCcForm1Engine::filter()
+{
+    QFETCH(QString, box);
+    QFETCH(QByteArray, data);
+    QFETCH(QString, expected);
+    Rig rig;
+    rig.engine->show_received(box, QString::fromLatin1(data));
+    QCOMPARE(box, expected);
+}
+
+void TestCcForm1Engine::trimBeforeNextArrival_data()
+{
+    QTest::addColumn<int>("held");
+    QTest::addColumn<int>("kept");
+    QTest::newRow("16001 keeps its last 11905") << 16001 << 11905;
+    QTest::newRow("16000 is kept whole") << 16000 << 16000;
+}
+
+void TestCcForm1Engine::trimBeforeNextArrival()
+{
+    QFETCH(int, held);
+    QFETCH(int, kept);
+    Rig rig;
+    QString filler;
+    for (int i = 0; i < held; ++i)
+        filler += QChar('a' + i % 7);
+    rig.engine->test3 = filler;
+    rig.line->deliver("#");
+    QCOMPARE(rig.engine->test3, filler.right(kept) + "#");
+}
+
+void TestCcForm1Engine::identityCheck_data()
+{
+    QTest::addColumn<QString>("selected");
+    QTest::addColumn<QByteArray>("reply");
+    QTest::addColumn<QString>("title");
+    QTest::newRow("00012 matches 12") << "12" << "ZZZZCONNECTK\x04" + identity("9.6", "00012") << "";
+    QTest::newRow("other ID") << "12" << identity("9.6", "00013") << "Wrong ID";
+    QTest::newRow("version not numeric") << "12" << identity("V9x", "00012")
+                                         << "Invalid Version Number";
+    QTest::newRow("ID not numeric") << "12" << identity("14", "0001A") << "Invalid ID Number";
+}
+
+void TestCcForm1Engine::identityCheck()
+{
+    QFETCH(QString, selected);
+    QFETCH(QByteArray, reply);
+    QFETCH(QString, title);
+    Rig rig;
+    rig.engine->setInstrument(selected, QString(), nullptr);
+    rig.engine->Command3_Click();
+    rig.line->deliverInBatches(reply, 5);
+    QVERIFY(rig.engine->test3.isEmpty());
+    QVERIFY(!rig.engine->connecting);
+    QVERIFY(!rig.engine->Timer8.Enabled());
+    if (title.isEmpty()) {
+        QVERIFY(rig.op.messages().isEmpty());
+        QCOMPARE(rig.engine->version.text, QStringLiteral("9.6    "));
+        QCOMPARE(rig.engine->resets.text, QStringLiteral("00003"));
+        QCOMPARE(rig.globals.instrument_version, QStringLiteral("9.6"));
+        QVERIFY(rig.line->isOpen());
+        QVERIFY(rig.engine->Command6.enabled && !rig.engine->Command3.enabled);
+    } else {
+        QCOMPARE(rig.op.titles(), QStringList{title});
+        QVERIFY(!rig.line->isOpen());
+        QVERIFY(!rig.globals.link_up);
+        QVERIFY(!rig.engine->Command6.enabled && rig.engine->Command3.enabled);
+        QCOMPARE(rig.engine->Text3[2].text, QStringLiteral("Port Closed"));
+    }
+}
+
+void TestCcForm1Engine::fiveTriesThenNoGlacinor()
+{
+    Rig rig;
+    rig.engine->Command3_Click();
+    rig.clock.advance(14999);
+    QCOMPARE(rig.line->writes().size(), 5);
+    QVERIFY(rig.op.messages().isEmpty());
+    rig.clock.advance(1);
+    for (const QByteArray& w : rig.line->writes())
+        QCOMPARE(w, commands::connectDirect());
+    QCOMPARE(rig.op.titles(), QStringList{"No Glacinor"});
+    QVERIFY(!rig.line->isOpen());
+    QCOMPARE(rig.engine->connect_tries, 0);
+    // A second connect gets its five tries again.
+    rig.line->clearWrites();
+    rig.engine->Command3_Click();
+    rig.clock.advance(15000);
+    QCOMPARE(rig.line->writes().size(), 5);
+}
+
+void TestCcForm1Engine::resetIgnoredWhileConnecting()
+{
+    Rig rig;
+    rig.engine->Command3_Click();
+    rig.line->deliver("AT&FE0\r");
+    QVERIFY(rig.op.messages().isEmpty());
+    QVERIFY(rig.engine->Timer8.Enabled());
+    QCOMPARE(rig.engine->test3, QStringLiteral("AT&FE0\r\n"));
+}
+
+void TestCcForm1Engine::resetOnEstablishedLine()
+{
+    Rig rig;
+    rig.open(Channels);
+    rig.engine->Command3_Click();
+    rig.line->deliver(identity("9.6", "00012"));
+    rig.line->deliver("AT&FE0\r");
+    QCOMPARE(rig.op.titles(), QStringList{"No Response"});
+    QCOMPARE(rig.views.calls, (QStringList{"Toolbar1", "channels.Timer5", "unload upload"}));
+    QVERIFY(!rig.line->isOpen());
+    QCOMPARE(rig.engine->Text3[2].text, QStringLiteral("Port Closed"));
+    QCOMPARE(rig.engine->version.text, QStringLiteral("????"));
+}
+
+void TestCcForm1Engine::command6SendsNothing()
+{
+    Rig rig;
+    rig.engine->Command3_Click();
+    rig.line->clearWrites();
+    rig.engine->Command6_Click();
+    QVERIFY(rig.line->writes().isEmpty());
+    QVERIFY(!rig.globals.link_up);
+}
+
+void TestCcForm1Engine::hangUpSleeps_data()
+{
+    QTest::addColumn<bool>("online");
+    QTest::addColumn<int>("slept");
+    QTest::addColumn<QByteArray>("sent");
+    QTest::newRow("modem on line") << true << 2500 << QByteArray("+++ATH0\r\n");
+    QTest::newRow("modem in command mode") << false << 200 << QByteArray("ATH0\r\n");
+}
+
+void TestCcForm1Engine::hangUpSleeps()
+{
+    QFETCH(bool, online);
+    QFETCH(int, slept);
+    QFETCH(QByteArray, sent);
+    Rig rig(false);
+    rig.engine->dial_num_Click();
+    if (online)
+        rig.line->deliver("CONNECT");
+    rig.line->clearWrites();
+    const qint64 before = rig.clock.sleptMs();
+    rig.engine->cancel_dial_Click();
+    QCOMPARE(rig.clock.sleptMs() - before, qint64(slept));
+    QCOMPARE(rig.line->written(), sent);
+    QVERIFY(!rig.line->isOpen());
+    QVERIFY(!rig.globals.modem_online);
+    // The pulse: up, down, back to what it was.
+    QCOMPARE(rig.line->dtrHistory().mid(rig.line->dtrHistory().size() - 3),
+             (QList<bool>{true, false, false}));
+}
+
+void TestCcForm1Engine::busyRedialsWithoutLimit()
+{
+    Rig rig(false);
+    // The count must not run while the message stands.
+    bool countingUnderMessage = false;
+    rig.op.setWhileShowing([&](const Operator::Message&) {
+        countingUnderMessage |= rig.engine->Timer2.Enabled();
+    });
+    rig.engine->dial_num_Click();
+    for (int call = 0; call < 4; ++call) {
+        rig.line->deliver("BUSY\r");
+        QVERIFY(!rig.line->isOpen());
+        QVERIFY(rig.engine->cancel_redial.enabled);
+        QVERIFY(!rig.engine->cmdOK.enabled);
+        rig.line->clearWrites();
+        rig.clock.advance(29999);
+        QVERIFY(rig.line->writes().isEmpty());
+        rig.clock.advance(1);
+        QCOMPARE(rig.line->writes().size(), 1);
+        QVERIFY(rig.line->lastWrite().startsWith("ATX4"));
+    }
+    QVERIFY(!countingUnderMessage);
+    QCOMPARE(rig.op.messages().size(), 4);
+    rig.line->deliver("BUSY\r");
+    rig.engine->cancel_redial_Click();
+    rig.clock.advance(60000);
+    QVERIFY(!rig.line->isOpen());
+    QVERIFY(rig.engine->cmdOK.enabled);
+}
+
+void TestCcForm1Engine::silentInstrumentRedialsUnderTheMessage()
+{
+    Rig rig(false);
+    bool counting = false;
+    rig.op.setWhileShowing([&](const Operator::Message& m) {
+        if (m.title == "No Glacinor")
+            counting = rig.engine->Timer2.Enabled();
+    });
+    rig.dialAndConnect();
+    rig.clock.advance(39999);
+    QCOMPARE(rig.op.titles(), QStringList{});
+    rig.clock.advance(1);
+    QCOMPARE(rig.op.last().lines.size(), 3);
+    QVERIFY(counting);
+    QVERIFY(rig.line->written().contains("+++ATH0\r\n"));
+}
+
+void TestCcForm1Engine::commsErrorSameStateForBothAnswers()
+{
+    auto run = [](Operator::Answer answer, ccForm1_engine*& out, Rig& rig) {
+        rig.op.queueAnswer(answer);
+        rig.engine->Command3_Click();
+        rig.line->raiseEvent(Line::TransmitFull);
+        out = rig.engine.get();
+    };
+    Rig a, b;
+    ccForm1_engine *ea = nullptr, *eb = nullptr;
+    run(Operator::Answer::Ok, ea, a);
+    run(Operator::Answer::Cancel, eb, b);
+    QCOMPARE(a.op.last().title, QStringLiteral("Click Cancel to quit, OK to ignore."));
+    QCOMPARE(a.op.last().lines, (QStringList{"Transmit Buffer Full", "Check communication setup"}));
+    for (ccForm1_engine* e : {ea, eb}) {
+        QCOMPARE(e->Text3[2].text, QStringLiteral("Port Closed"));
+        QVERIFY(e->Command3.enabled && !e->Command6.enabled);
+        QVERIFY(e->comm_fault);
+    }
+    QVERIFY(!a.line->isOpen() && !b.line->isOpen());
+    QCOMPARE(a.globals.link_up, b.globals.link_up);
+    QCOMPARE(a.op.beeps(), 1);
+    // The slot is never emptied: the next connect's first arrival closes again.
+    a.engine->Command3_Click();
+    a.line->deliver("noise");
+    QCOMPARE(a.op.messages().size(), 2);
+    QVERIFY(!a.line->isOpen());
+}
+
+void TestCcForm1Engine::eventMessageHidesErrors()
+{
+    Rig rig;
+    rig.engine->Command3_Click();
+    rig.line->raiseEvent(Line::CdChanged);
+    rig.line->raiseEvent(Line::CtsTimeout);
+    QVERIFY(rig.op.messages().isEmpty());
+    QCOMPARE(rig.engine->sbrStatus[1].text, QStringLiteral("Status: Change in CD Detected"));
+    rig.clock.advance(2000);
+    QCOMPARE(rig.engine->sbrStatus[1].text, QStringLiteral("Status: "));
+    rig.line->deliver("x");
+    QCOMPARE(rig.engine->sbrStatus[1].text, QStringLiteral("Status: Change in CD Detected"));
+    QVERIFY(rig.line->isOpen());
+}
+
+void TestCcForm1Engine::modemTestLeavesLinkUp()
+{
+    Rig rig(false);
+    rig.engine->modem_Change(QStringLiteral("I4"));
+    rig.engine->ModemTest_Click();
+    QCOMPARE(rig.line->lastWrite(), QByteArray("ATI4\r\n"));
+    QVERIFY(rig.engine->modem.text.isEmpty());
+    rig.line->deliver("OK\r");
+    QCOMPARE(rig.engine->modem.text, QStringLiteral("I4OK\r\n"));
+    rig.clock.advance(3000);
+    QVERIFY(!rig.line->isOpen());
+    QVERIFY(rig.globals.link_up);
+    QVERIFY(!rig.engine->modem_test);
+    QVERIFY(rig.engine->test3.isEmpty());
+}
+
+void TestCcForm1Engine::baudRateRule_data()
+{
+    QTest::addColumn<int>("index");
+    QTest::addColumn<bool>("refused");
+    QTest::addColumn<int>("factor");
+    QTest::newRow("1200") << 3 << true << 1;
+    QTest::newRow("14400 is too fast, same title") << 7 << true << 1;
+    QTest::newRow("2400") << 4 << false << 4;
+    QTest::newRow("4800") << 5 << false << 2;
+    QTest::newRow("9600") << 6 << false << 1;
+}
+
+void TestCcForm1Engine::baudRateRule()
+{
+    QFETCH(int, index);
+    QFETCH(bool, refused);
+    QFETCH(int, factor);
+    Rig rig;
+    rig.engine->cboSpeed_Click(index);
+    QCOMPARE(rig.op.titles(), refused ? QStringList{"Baud Rate to Slow"} : QStringList{});
+    QCOMPARE(rig.engine->cboSpeed.value.toInt(), refused ? 6 : index);
+    QCOMPARE(rig.globals.speed_factor, factor);
+    if (refused)
+        QCOMPARE(rig.settings.value("Settings").toString(), QStringLiteral("9600,n,8,1"));
+}
+
+void TestCcForm1Engine::connectionTypeRefusedWithPortOpen()
+{
+    Rig rig;
+    rig.engine->Command3_Click();
+    rig.engine->Option2_Click(0);
+    QCOMPARE(rig.op.titles(), QStringList{"Port Open"});
+    QVERIFY(rig.engine->Option2[1].value.toBool());
+    QVERIFY(rig.engine->Frame9.enabled && !rig.engine->Frame8.enabled);
+    QCOMPARE(rig.globals.reply_wait_ms, 4000);
+    rig.engine->Command6_Click();
+    rig.engine->Option2_Click(0);
+    QVERIFY(rig.engine->Frame8.enabled && rig.engine->FrameDial.visible);
+    QCOMPARE(rig.globals.reply_wait_ms, 7000);
+}
+
+void TestCcForm1Engine::newAlarm_data()
+{
+    QTest::addColumn<int>("open");
+    QTest::addColumn<bool>("cycle");
+    QTest::addColumn<QStringList>("calls");
+    QTest::addColumn<QStringList>("titles");
+    QTest::newRow("status cycle running holds it back")
+        << int(Status) << true << QStringList{} << QStringList{"Alarm Active"};
+    QTest::newRow("status stopped opens the alarm view")
+        << int(Status) << false << QStringList{"mnualarmon_Click", "uploadnew_Click"} << QStringList{};
+    QTest::newRow("graphic cycle does not hold it back")
+        << int(StatusG) << true << QStringList{"mnualarmon_Click", "uploadnew_Click"} << QStringList{};
+    QTest::newRow("alarm view open is maximised")
+        << int(Alarm) << false << QStringList{"showMaximised", "uploadnew_Click"} << QStringList{};
+}
+
+void TestCcForm1Engine::newAlarm()
+{
+    QFETCH(int, open);
+    QFETCH(bool, cycle);
+    QFETCH(QStringList, calls);
+    QFETCH(QStringList, titles);
+    Rig rig;
+    rig.open(open);
+    rig.views.cycleRunning = cycle;
+    rig.line->deliver("alm-new");
+    QCOMPARE(rig.views.calls, calls);
+    QCOMPARE(rig.op.titles(), titles);
+}
+
+void TestCcForm1Engine::openFailureNamesTheReason()
+{
+    Rig rig;
+    const QString reason = QStringLiteral("Permission denied on /dev/ttyUSB0: add your user to the "
+                                          "dialout group");
+    rig.line->failNextOpen(reason);
+    rig.engine->Command3_Click();
+    QCOMPARE(rig.op.last().title, QStringLiteral("Invalid Port"));
+    QCOMPARE(rig.op.last().lines.last(), reason);
+    QVERIFY(!rig.globals.link_up);
+    QVERIFY(rig.line->writes().isEmpty());
+}
+
+void TestCcForm1Engine::portChangeMakesNewLine()
+{
+    Rig rig;
+    rig.engine->Command3_Click();
+    FakeLine* first = rig.line;
+    rig.engine->cboPort_Change(QStringLiteral("127.0.0.1:4001"));
+    rig.engine->cmdOK_Click();
+    QVERIFY(rig.line != first);
+    QCOMPARE(rig.line->portName(), QStringLiteral("127.0.0.1:4001"));
+    QVERIFY(rig.line->isOpen());
+    QVERIFY(rig.globals.link_up);
+    QCOMPARE(rig.settings.value("CommPort").toString(), QStringLiteral("127.0.0.1:4001"));
+}
+
+QTEST_GUILESS_MAIN(TestCcForm1Engine)
+#include "tst_ccform1_engine.moc"
