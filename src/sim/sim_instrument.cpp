@@ -167,7 +167,14 @@ void Instrument::modemLine(const QByteArray& raw)
         m_x4 = true;
     else if (line.contains("X0"))
         m_x4 = false;
-    const int d = line.indexOf('D', 2);
+    // The dial command: "DT" or "DP", or "D" and a digit (not "&D2", which
+    // the operator's modem text may hold).
+    int d = int(line.indexOf("DT", 2));
+    if (d < 0)
+        d = int(line.indexOf("DP", 2));
+    for (int i = 2; d < 0 && i + 1 < line.size(); ++i)
+        if (line[i] == 'D' && line[i - 1] != '&' && QChar::fromLatin1(line[i + 1]).isDigit())
+            d = i;
     if (d >= 0 && m_modem == ModemState::Command) {
         QByteArray result = m_faults.dial.isEmpty() ? QByteArray("CONNECT")
                                                     : m_faults.dial.value(qMin(m_dials, int(m_faults.dial.size()) - 1));

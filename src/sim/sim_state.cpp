@@ -138,7 +138,7 @@ void InstrumentState::seed()
         else if (isSensor(n))
             r.value = 120 + noise(50);
         else if (isPressureInput(n))
-            r.value = 3000 + noise(500);
+            r.value = n <= 200 ? 3000 + noise(500) : 800 + noise(100);
     }
     // A few inputs that read a special value.
     m_rooms[106].special = OverRange;
@@ -267,7 +267,9 @@ void InstrumentState::stepPlantRoom(double dt)
         if (isSensor(n)) {
             r.value = 120 + 80 * qSin((minute + n * 40) * M_PI / 720.0) + noise(3);
         } else if (isPressureInput(n)) {
-            r.value += (3000 - r.value) * dt / 600 + noise(20);
+            // 196-200 read tenths, the inputs from 201 on whole KPA.
+            const double level = n <= 200 ? 3000 : 800;
+            r.value += (level - r.value) * dt / 600 + noise(n <= 200 ? 20 : 5);
         }
         if (n > 100 || !f[1])
             continue;

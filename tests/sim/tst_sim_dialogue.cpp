@@ -296,6 +296,8 @@ void TstSimDialogue::modem_data()
         << QString("dial = busy, busy, connect") << QByteArray("ATX4DT1\r\nATX4DT1\r\nATX4DT1\r\n")
         << QByteArray("\r\nBUSY\r\n\r\nBUSY\r\n\r\nCONNECT 9600\r\n");
     QTest::newRow("plain ATDT") << QString("dial = connect") << QByteArray("ATDT1\r\n") << QByteArray("\r\nCONNECT 9600\r\n");
+    QTest::newRow("modem text with &D2") << QString("dial = connect") << QByteArray("ATX4&D2DT1\r\n") << QByteArray("\r\nCONNECT 9600\r\n");
+    QTest::newRow("&D2 is no dial") << QString("dial = connect") << QByteArray("ATX4&D2\r\n") << QByteArray("\r\nOK\r\n");
 }
 
 void TstSimDialogue::modem()
