@@ -35,7 +35,9 @@ Instrument:
                       Sizes of the three logs in records (200, 1000, 2000).
   --modem             Put a Hayes modem in front: dial, CONNECT 9600, +++.
   --nocomp            The instrument has no computer link: answers "nocomp".
-  --no-greeting       Do not send "AT&FE0" at start.
+  --greet             Send "AT&FE0" at start also on a pty, where it waits for
+                      the first client (a line nobody listens to loses it, so
+                      by default only a reset greets on the line).
   --scenario FILE     Read "key = value" lines (below) at start.
   --help              This text.
 
@@ -80,7 +82,7 @@ int main(int argc, char** argv)
 
     sim::Options options;
     sim::Instrument::Settings settings;
-    bool pty = false, greeting = true, nocomp = false;
+    bool pty = false, greeting = false, nocomp = false;
     int tcpPort = -1;
     QString scenario;
     for (int i = 0; i < args.size(); ++i) {
@@ -138,8 +140,8 @@ int main(int argc, char** argv)
             settings.modem = true;
         } else if (a == QLatin1String("--nocomp")) {
             nocomp = true;
-        } else if (a == QLatin1String("--no-greeting")) {
-            greeting = false;
+        } else if (a == QLatin1String("--greet")) {
+            greeting = true;
         } else if (a == QLatin1String("--scenario")) {
             ok = value(scenario);
         } else {

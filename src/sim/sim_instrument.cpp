@@ -78,7 +78,8 @@ void Instrument::advance(qint64 realMs)
 
 void Instrument::send(const QByteArray& bytes, int extraDelayMs)
 {
-    if (bytes.isEmpty())
+    // Behind a modem without a call nothing of the instrument gets through.
+    if (bytes.isEmpty() || !lineUp())
         return;
     const int delay = m_faults.delayMs + extraDelayMs;
     if (delay == 0 && m_faults.batchBytes <= 0 && m_queue.isEmpty()) {

@@ -333,7 +333,7 @@ void InstrumentState::stepPlantRoom(double dt)
             r.alarm = true;
             logAlarm(n, high ? 1 : 2, reading(n));
         } else if (!high && !low && r.highFor == 0 && r.lowFor == 0) {
-            r.alarm = false;
+            r.alarm = r.latched;
         }
     }
 }
@@ -492,7 +492,7 @@ void InstrumentState::logAlarm(int channel, int kind, int value)
 void InstrumentState::raiseAlarm(int channel)
 {
     if (channel >= 1 && channel <= 200)
-        m_rooms[channel - 1].alarm = true;
+        m_rooms[channel - 1].alarm = m_rooms[channel - 1].latched = true;
     logAlarm(channel, 1, channel <= Channels ? reading(channel) : 1);
 }
 
@@ -508,7 +508,7 @@ bool InstrumentState::clearAlarms()
     bool any = !alarms.records.isEmpty();
     for (auto& r : m_rooms) {
         any = any || r.alarm;
-        r.alarm = false;
+        r.alarm = r.latched = false;
         r.highFor = r.lowFor = 0;
     }
     alarms.clear();

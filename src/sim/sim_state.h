@@ -67,6 +67,7 @@ struct RoomState {
     double value = 0;    // tenths, or the channel's unit
     int special = 0;     // 0, or one of Special
     bool alarm = false;
+    bool latched = false; // raised by hand: stays until the alarms are cleared
     double highFor = 0;  // seconds above the high limit
     double lowFor = 0;
     bool liquid = false, fan = false, defrost = false, suction = false;

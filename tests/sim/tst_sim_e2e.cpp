@@ -57,7 +57,7 @@ void TstSimE2e::overPty()
     QProcess sim;
     sim.start(QStringLiteral(Q19SIM_PATH),
               {QStringLiteral("--pty"), QStringLiteral("--version"), QStringLiteral("14"), QStringLiteral("--id"),
-               QStringLiteral("12"), QStringLiteral("--history-hours"), QStringLiteral("2"), QStringLiteral("--no-greeting")});
+               QStringLiteral("12"), QStringLiteral("--history-hours"), QStringLiteral("2")});
     QVERIFY(sim.waitForStarted(5000));
     QVERIFY(sim.waitForReadyRead(10000));
     const QString path = QString::fromLocal8Bit(sim.readLine()).trimmed();

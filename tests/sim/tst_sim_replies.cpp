@@ -115,6 +115,21 @@ void TstSimReplies::downloadRecord_data()
     QTest::newRow("216") << QByteArray("14") << QByteArray("215,1,0,0,360,720,1080,Dock 1,2,0,15,30,45,") << true << 215 << 94 << 45;
     QTest::newRow("216 short") << QByteArray("14") << QByteArray("215,1,0,0,360,720,1080,Dock 1,2,0,15,30,") << false << 215 << 94 << 1080;
     QTest::newRow("216 not numeric") << QByteArray("14") << QByteArray("215,1,0,0,360,720,x,Dock 1,2,0,15,30,45,") << false << 215 << 94 << 1080;
+    // A record of n values for the wire channel, the description in its
+    // place, the last value 77.
+    auto record = [](int wire, int n) {
+        QByteArray r = QByteArray::number(wire) + ",1,0,0,0,0,0,Dock 1,";
+        for (int i = 7; i < n - 1; ++i)
+            r += "0,";
+        return r + "77,";
+    };
+    QTest::newRow("41 v14 ends at 224") << QByteArray("14") << record(40, 74) << true << 40 << 224 << 77;
+    QTest::newRow("41 v14 one more") << QByteArray("14") << record(40, 75) << false << 40 << 224 << 0;
+    QTest::newRow("41 v9.6 without 223-224") << QByteArray("9.6") << record(40, 72) << true << 40 << 12 << 77;
+    QTest::newRow("41 v9.6 with them") << QByteArray("9.6") << record(40, 74) << false << 40 << 12 << 0;
+    QTest::newRow("33 v14 has 225-227") << QByteArray("14") << record(32, 77) << true << 32 << 227 << 77;
+    QTest::newRow("28 v14 ends at 227") << QByteArray("14") << record(27, 77) << true << 27 << 227 << 77;
+    QTest::newRow("27 v9.6 compressor") << QByteArray("9.6") << record(26, 77) << true << 26 << 167 << 77;
     QTest::newRow("216 no last comma") << QByteArray("14") << QByteArray("215,1,0,0,360,720,1080,Dock 1,2,0,15,30,45") << false << 215 << 94 << 1080;
 }
 
