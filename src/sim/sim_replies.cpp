@@ -130,7 +130,7 @@ QByteArray pressureReply(const InstrumentState& s)
         // the kind), an analogue value.
         for (int t = 0; t * 96 < 216 * 6; ++t) {
             const int base = 96 * t + 1385;
-            const bool fitted = t < comps && wireKind(s.field(t, 165)) == 2;
+            const bool fitted = t < comps && (s.field(t, 165) == 8 || s.field(t, 165) == 10);
             const Compressor& c = s.compressor(t);
             const int bank = 0;
             const int temps[4] = {-50 + int(c.running) * 10, 700 + 50 * c.running, 450, 520};

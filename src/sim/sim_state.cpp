@@ -20,7 +20,7 @@ int unitsOfKind(int kind)
         return kind + 1;
     if (kind == 7)
         return 8;
-    if (kind == 9)
+    if (kind == 9 || kind == 10)
         return 4;
     return 2;
 }
@@ -97,7 +97,9 @@ void InstrumentState::seed()
             f[223] = 20, f[224] = 0, f[225] = 20, f[226] = 10, f[227] = 10;
         }
         if (n <= 27) {
-            static const int kinds[] = {1, 8, 0, 9, 1, 0, 2};
+            // 2-stage, screw, 1-stage, variable; 2-stage, 1-stage, screw
+            // with variable drive. Both screws carry a Torvanel.
+            static const int kinds[] = {1, 8, 0, 9, 1, 0, 10};
             f[168] = 20;
             f[165] = n <= 7 ? kinds[n - 1] : 0;
             f[166] = 10, f[207] = n, f[167] = (n == 1 || n == 3) ? 5 : 0;

@@ -2,6 +2,9 @@
 
 #include <QElapsedTimer>
 #include <QProcess>
+#include <QTcpServer>
+#include <QTcpSocket>
+#include <QTemporaryFile>
 #include <QTest>
 
 #include <fcntl.h>
@@ -36,6 +39,7 @@ class TstSimE2e : public QObject {
 private slots:
     void help();
     void overPty();
+    void modemOverTcp();
 };
 
 void TstSimE2e::help()
@@ -96,6 +100,45 @@ void TstSimE2e::overPty()
     QCOMPARE(readUntil(fd, "Glacinor").mid(7, 5), QByteArray("00007"));
 
     ::close(fd);
+    sim.kill();
+    sim.waitForFinished(5000);
+}
+
+void TstSimE2e::modemOverTcp()
+{
+    quint16 port = 0;
+    {
+        QTcpServer probe; // a port that is free now
+        QVERIFY(probe.listen(QHostAddress::LocalHost));
+        port = probe.serverPort();
+    }
+    QTemporaryFile scenario;
+    QVERIFY(scenario.open());
+    scenario.write("# a busy number first\ndial = busy, connect\n");
+    scenario.close();
+    QProcess sim;
+    sim.start(QStringLiteral(Q19SIM_PATH), {QStringLiteral("--tcp"), QString::number(port), QStringLiteral("--modem"),
+                                            QStringLiteral("--history-hours"), QStringLiteral("0"),
+                                            QStringLiteral("--scenario"), scenario.fileName()});
+    QVERIFY(sim.waitForReadyRead(10000));
+    QCOMPARE(sim.readLine().trimmed(), QByteArray("127.0.0.1:") + QByteArray::number(port));
+
+    QTcpSocket line;
+    line.connectToHost(QHostAddress::LocalHost, port);
+    QVERIFY(line.waitForConnected(5000));
+    auto talk = [&](const QByteArray& out, const QByteArray& token) {
+        line.write(out);
+        QByteArray got;
+        QElapsedTimer t;
+        t.start();
+        while (!got.endsWith(token) && t.elapsed() < 5000)
+            if (line.waitForReadyRead(100))
+                got += line.readAll();
+        return got;
+    };
+    QCOMPARE(talk("ATX4DT5551234\r\n", "BUSY\r\n"), QByteArray("\r\nBUSY\r\n"));
+    QCOMPARE(talk("ATX4DT5551234\r\n", "CONNECT 9600\r\n"), QByteArray("\r\nCONNECT 9600\r\n"));
+    QCOMPARE(talk("K", "Glacinor").mid(7, 5), QByteArray("00001"));
     sim.kill();
     sim.waitForFinished(5000);
 }
