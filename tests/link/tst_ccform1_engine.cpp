@@ -2,6 +2,9 @@
 #include "link/commands.h"
 #include "platform/fake_line.h"
 #include "platform/manual_clock.h"
+#include "platform/store.h"
+
+#include <QTemporaryDir>
 
 #include <QtTest>
 
@@ -149,6 +152,7 @@ private slots:
     void newAlarm();
     void openFailureNamesTheReason();
     void portChangeMakesNewLine();
+    void settingsLiveInTheInstrumentsInfoRows();
 };
 
 void TestCcForm1Engine::dispatch_data()
@@ -620,6 +624,46 @@ void TestCcForm1Engine::portChangeMakesNewLine()
     QVERIFY(rig.line->isOpen());
     QVERIFY(rig.globals.link_up);
     QCOMPARE(rig.settings.value("CommPort").toString(), QStringLiteral("127.0.0.1:4001"));
+}
+
+void TestCcForm1Engine::settingsLiveInTheInstrumentsInfoRows()
+{
+    QTemporaryDir dir;
+    std::unique_ptr<Store> store = Store::create(dir.filePath("t-12.db"), 1);
+    QVERIFY(store);
+    QList<Store::Column> columns;
+    for (int c = 0; c < 42; ++c)
+        columns.append({QStringLiteral("f%1").arg(c), Store::ColumnType::Text});
+    QVERIFY(store->createTable("info", columns));
+    std::unique_ptr<Recordset> info = store->openRecordset("info");
+    const QStringList stored = {"", "", "4800,e,7,2", "/dev/ttyACM3", "1", "7", "&C1", "2"};
+    for (const QString& v : stored) {
+        QVERIFY(info->AddNew() && info->setValue(41, v.isEmpty() ? QVariant() : QVariant(v))
+                && info->Update());
+    }
+
+    Rig rig(false);
+    rig.engine->setInstrument("12", "555", info.get());
+    rig.engine->LoadPropertySettings();
+    QCOMPARE(rig.engine->CommPort(), QStringLiteral("/dev/ttyACM3"));
+    QCOMPARE(rig.line->settings().toText(), QStringLiteral("4800,e,7,2"));
+    QCOMPARE(rig.line->handshaking(), Handshaking::Rts);
+    QCOMPARE(rig.globals.speed_factor, 2);
+    QVERIFY(rig.engine->Option2[1].value.toBool());
+    // Row 5 holds neither 0 nor 1: the default goes back into the file.
+    QVERIFY(rig.engine->DialTone[0].value.toBool());
+    QCOMPARE(info->cell(5, 41).toInt(), 0);
+    QCOMPARE(rig.engine->modem.text, QStringLiteral("&C1"));
+
+    rig.engine->cboParity_Click(rig.engine->cboParityItems.indexOf("None"));
+    rig.engine->cboDataBits_Click(rig.engine->cboDataBitsItems.indexOf("8"));
+    rig.engine->cboStopBits_Click(0);
+    rig.engine->optFlow_Click(0);
+    rig.engine->cmdOK_Click();
+    QCOMPARE(info->cell(2, 41).toString(), QStringLiteral("4800,n,8,1"));
+    QCOMPARE(info->cell(7, 41).toInt(), 0);
+    QCOMPARE(rig.settings.value("Settings").toString(), QStringLiteral("4800,n,8,1"));
+    QCOMPARE(rig.line->settings().toText(), QStringLiteral("4800,n,8,1"));
 }
 
 QTEST_GUILESS_MAIN(TestCcForm1Engine)
