@@ -1,0 +1,294 @@
+#include "link/open_views.h"
+#include "platform/manual_clock.h"
+#include "platform/operator.h"
+#include "setpoints/instrument_schema.h"
+#include "setpoints/instrument_store.h"
+#include "status/frmstatus_engine.h"
+#include "status/frmstatusp_engine.h"
+#include "status_test_support.h"
+
+#include <QTemporaryDir>
+#include <QTest>
+
+namespace {
+
+struct Rig {
+    QTemporaryDir dir;
+    QString path = dir.filePath(QStringLiteral("t-7.db"));
+    ManualClock clock;
+    TestLink link{clock};
+    ScriptedOperator op;
+    OpenViews views;
+    std::unique_ptr<InstrumentStore> store;
+    Rig()
+    {
+        createInstrumentTemplate(path);
+        store = InstrumentStore::open(path);
+    }
+    void select(const QList<int>& channels)
+    {
+        for (int i = 0; i < 20; ++i)
+            store->setInfo(i, 7, i < channels.size() ? channels[i] : 0);
+    }
+};
+
+} // namespace
+
+class tst_status_engines : public QObject {
+    Q_OBJECT
+private slots:
+    void statusRows();
+    void suctionAndPressureBoxesByVersion_data();
+    void suctionAndPressureBoxesByVersion();
+    void pidByControlKind_data();
+    void pidByControlKind();
+    void twentyFirstSelectionRefused();
+    void alarmBlinks();
+    void compressorRecordsByNumber();
+    void variableSteps();
+    void torvanelRequestFromVersion8_data();
+    void torvanelRequestFromVersion8();
+    void torvanelAlarmWords();
+    void dbaseFailure();
+};
+
+void tst_status_engines::statusRows()
+{
+    Rig r;
+    r.select({5, 150, 0, 7});
+    r.store->setSetpoint(4, 26, 215); // channel 5: assoc 1 none
+    r.store->setSetpoint(4, 27, 200); // a pressure input
+    r.store->setSetpoint(4, 28, 199); // channel 200
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    QCOMPARE(e.cycle.Text10[0].text, QStringLiteral("7"));
+    QVERIFY(!e.chanframe[2].visible);
+    QVERIFY(e.chanframe[1].visible);
+    QVERIFY(!e.assoc1[1].visible && !e.liquid[1].visible && !e.bank[1].visible);
+    QCOMPARE(e.Temp[2].text, QStringLiteral("????"));
+    ReplyText t(2600, QStringLiteral("status"));
+    t.put(1, "05/01/2026 08:00:00").num(7 * 5 + 13, -1004).put(7 * 5 + 19, "1").num(7 * 150 + 13, 55);
+    t.num(1413, 321).put(4 * 5 + 1416, "1").put(4 * 5 + 1417, "1").put(4 * 5 + 1418, "1");
+    e.status_do(t.str());
+    QCOMPARE(e.Temp[0].text, QStringLiteral("Ld Shd"));
+    QCOMPARE(e.alarm[0].backColor, frmstatus_engine::PaleRed);
+    QVERIFY(!e.assoc1[0].visible);
+    QCOMPARE(e.assoc2[0].text, QStringLiteral("Press"));
+    QCOMPARE(e.assoc3[0].text, QStringLiteral("32.1"));
+    QCOMPARE(e.liquid[0].backColor, frmstatus_engine::PaleRed);
+    QCOMPARE(e.fans[0].backColor, frmstatus_engine::FanOn);
+    QCOMPARE(e.defrost[0].backColor, frmstatus_engine::DefrostOn);
+    QCOMPARE(e.suction[0].backColor, frmstatus_engine::Off);
+    QCOMPARE(e.Temp[1].text, QStringLiteral("5.5"));
+    QCOMPARE(e.Temp[2].text, QStringLiteral("????")); // an empty row is not parsed
+    QCOMPARE(e.cycle.Text10[2].text, QStringLiteral("05/01/2026 08:00:00"));
+    QCOMPARE(e.cycle.Text10[2].backColor, StatusCycle::FlashColour);
+}
+
+void tst_status_engines::suctionAndPressureBoxesByVersion_data()
+{
+    QTest::addColumn<QString>("version");
+    QTest::addColumn<QString>("suc");
+    QTest::addColumn<QString>("tempP");
+    QTest::newRow("7") << "7" << "N/A" << "N/A";
+    QTest::newRow("8") << "8" << "-1002" << "N/A";
+    QTest::newRow("8.8") << "8.8" << "-1002" << "N-C";
+}
+
+void tst_status_engines::suctionAndPressureBoxesByVersion()
+{
+    QFETCH(QString, version);
+    Rig r;
+    r.link.g.instrument_version = version;
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    e.status_do(ReplyText(2600, "status").num(1820, -1002).num(1385, -1000).str());
+    QTEST(e.suc[0].text, "suc");
+    QTEST(e.TempP[0].text, "tempP");
+}
+
+void tst_status_engines::pidByControlKind_data()
+{
+    QTest::addColumn<QString>("version");
+    QTest::addColumn<int>("kind");
+    QTest::addColumn<QString>("pid");
+    QTest::addColumn<QString>("fan");
+    QTest::newRow("kind 4 below 14") << "13" << 4 << "PID" << "Fan";
+    QTest::newRow("kind 4") << "14" << 4 << "PID 45 %" << "Fan";
+    QTest::newRow("kind 5") << "14" << 5 << "PID 60 %" << "Fan 70 %";
+}
+
+void tst_status_engines::pidByControlKind()
+{
+    QFETCH(QString, version);
+    QFETCH(int, kind);
+    Rig r;
+    r.link.g.instrument_version = version;
+    r.select({3});
+    r.store->setSetpoint(2, 209, kind);
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    e.status_do(ReplyText(2700, "status").num(6 * 3 + 1910, 45).num(6 * 3 + 2306, 60).num(6 * 3 + 2498, 70).str());
+    QTEST(e.pid[0].text, "pid");
+    QTEST(e.fans[0].text, "fan");
+}
+
+void tst_status_engines::twentyFirstSelectionRefused()
+{
+    Rig r;
+    QList<int> twenty;
+    for (int n = 1; n <= 20; ++n)
+        twenty.append(n);
+    r.select(twenty);
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    QCOMPARE(e.Command1[20].backColor, frmstatus_engine::Selected);
+    e.Command1_Click(30);
+    QCOMPARE(r.op.last().title, QStringLiteral("Channel Display Full"));
+    QCOMPARE(e.Command1[30].backColor, frmstatus_engine::Off);
+    for (int i = 0; i < 20; ++i)
+        QCOMPARE(r.store->info(i, 7).toInt(), i + 1);
+    // Freeing a place lets the new channel fill the first gap.
+    e.Command1_Click(4);
+    e.Command1_Click(30);
+    QCOMPARE(r.store->info(3, 7).toInt(), 30);
+    QCOMPARE(e.rowChannel(3), 30);
+    e.Command2_Click();
+    QCOMPARE(r.store->info(3, 7).toInt(), 0);
+    QVERIFY(!e.chanframe[3].visible);
+}
+
+void tst_status_engines::alarmBlinks()
+{
+    Rig r;
+    r.select({1, 2});
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    e.status_do(ReplyText(2600, "status").put(7 + 19, "1").str());
+    QCOMPARE(e.alarm[0].backColor, frmstatus_engine::PaleRed);
+    r.clock.advance(1000);
+    QCOMPARE(e.alarm[0].backColor, Colour::Yellow);
+    QCOMPARE(e.alarm[1].backColor, frmstatus_engine::Off);
+    r.clock.advance(1000);
+    QCOMPARE(e.alarm[0].backColor, frmstatus_engine::PaleRed);
+}
+
+void tst_status_engines::compressorRecordsByNumber()
+{
+    using namespace presss_layout;
+    Rig r;
+    frmstatusp_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    ReplyText t(1400, "presss");
+    // Record 0 carries compressor 12, staged, 2 stages running; record 1 is
+    // empty; record 2 carries compressor 1, a screw, fully loaded.
+    t.num(recordNumberPos(0), 12).num(recordStagesPos(0), 2).num(recordKindPos(0), 0).put(recordRunningPos(0), "1");
+    t.num(recordNumberPos(1), 0).num(recordStagesPos(1), 6).put(recordRunningPos(1), "1");
+    t.num(recordNumberPos(2), 1).num(recordKindPos(2), 2).put(recordRunningPos(2), "1").put(recordFullPos(2), "1");
+    t.num(hoursRunPos(11), 1234);
+    e.statusp_do(t.str());
+    QCOMPARE(e.stage1[11].backColor, frmstatusp_engine::StageOn);
+    QCOMPARE(e.stage3[11].backColor, frmstatusp_engine::StageOn);
+    QCOMPARE(e.stage4[11].backColor, frmstatusp_engine::Off);
+    QCOMPARE(e.stage1[0].backColor, frmstatusp_engine::StageOn);
+    QCOMPARE(e.stage4[0].text, QStringLiteral("Fully"));
+    QCOMPARE(e.stage4[0].backColor, frmstatusp_engine::LoadedOn);
+    QCOMPARE(e.stage1[1].backColor, frmstatusp_engine::Off);
+    QCOMPARE(e.hours_run[11].text, QStringLiteral("1234 H"));
+}
+
+void tst_status_engines::variableSteps()
+{
+    using namespace presss_layout;
+    Rig r;
+    r.store->setSetpoint(2, 169, 4); // condenser 3 variable
+    r.store->setSetpoint(3, 169, 4);
+    frmstatusp_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    QCOMPARE(e.stage1c[2].text, QStringLiteral("Var Stg 1"));
+    ReplyText t(1400, "presss");
+    t.num(recordNumberPos(0), 5).num(recordKindPos(0), 3).put(recordRunningPos(0), "1").num(compressorStepPos(4), 63);
+    t.num(recordNumberPos(1), 6).num(recordKindPos(1), 3).put(recordRunningPos(1), "1").num(compressorStepPos(5), 0);
+    t.num(condenserStepPos(2), 64).num(condenserStepPos(3), 31);
+    e.statusp_do(t.str());
+    QCOMPARE(e.stage3[4].text, QStringLiteral("Step 64"));
+    QCOMPARE(e.stage5[4].text, QStringLiteral("100 %"));
+    QCOMPARE(e.stage3[5].text, QStringLiteral("Step 1"));
+    QCOMPARE(e.stage5[5].text, QStringLiteral("2 %"));
+    QCOMPARE(e.stage3[5].backColor, frmstatusp_engine::StepOn);
+    // The top step of a condenser shows as step 0 with the first box lit.
+    QCOMPARE(e.stage2c[2].text, QStringLiteral("Step 0"));
+    QCOMPARE(e.stage4c[2].text, QStringLiteral("0 %"));
+    QCOMPARE(e.stage1c[2].backColor, frmstatusp_engine::StepOn);
+    QCOMPARE(e.stage2c[2].backColor, frmstatusp_engine::Off);
+    QCOMPARE(e.stage2c[3].text, QStringLiteral("Step 32"));
+    QCOMPARE(e.stage4c[3].text, QStringLiteral("50 %"));
+}
+
+void tst_status_engines::torvanelRequestFromVersion8_data()
+{
+    QTest::addColumn<QString>("version");
+    QTest::addColumn<bool>("asks");
+    QTest::newRow("7") << "7" << false;
+    QTest::newRow("8") << "8" << true;
+}
+
+void tst_status_engines::torvanelRequestFromVersion8()
+{
+    QFETCH(QString, version);
+    QFETCH(bool, asks);
+    Rig r;
+    r.link.g.instrument_version = version;
+    frmstatusp_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    QCOMPARE(r.link.writes, QList<QByteArray>{"T\x04"});
+    e.statusp_do(ReplyText(1400, "presss").str());
+    r.clock.advance(499);
+    QCOMPARE(r.link.writes.size(), 1);
+    r.clock.advance(1);
+    QCOMPARE(r.link.writes.size(), asks ? 2 : 1);
+    if (asks)
+        QCOMPARE(r.link.writes.last(), QByteArray(85, 'Z') + "t\x04");
+    e.statuspa_do(ReplyText(1140, "torvan").put(20, "1").num(1100, 215).str());
+    QCOMPARE(e.CsAlarms != frmstatusp_engine::CsAlarmsInitial, asks);
+    QCOMPARE(e.Temp[0].text, QStringLiteral("????")); // 8.8 brings these
+}
+
+void tst_status_engines::torvanelAlarmWords()
+{
+    using namespace presss_layout;
+    Rig r;
+    r.link.g.instrument_version = QStringLiteral("8.8");
+    frmstatusp_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    // Torvanel 0 reports "In Alarm" (the third further input).
+    ReplyText p(1385 + 2 * 96, "presss");
+    p.put(1385 + 82 + 2, "1");
+    e.statusp_do(p.str());
+    e.dbaseload_Click();
+    QVERIFY(e.Picture1.visible);
+    QCOMPARE(e.Text3[frmstatusp_engine::PanelAlarm].text, QStringLiteral("YES"));
+    e.statuspa_do(ReplyText(1140, "torvan").put(alarmFlagPos(1, 9), "1").num(1100, 215).str());
+    QCOMPARE(e.Alm.text, QStringLiteral("Unknown Alarm's"));
+    QCOMPARE(e.Temp[0].text, QStringLiteral("21.5"));
+    e.CompSelect_Click(1);
+    QCOMPARE(e.Label4.text, QStringLiteral("Torvanel No. 2 Alarms"));
+    QCOMPARE(e.Alm.text, QStringLiteral("Discharge Pressure       \r\n"));
+    QCOMPARE(e.CompSelect[1].backColor, frmstatusp_engine::StepOn);
+    QCOMPARE(e.CompSelect[0].backColor, frmstatusp_engine::Off);
+    e.CompSelect_Click(2);
+    QCOMPARE(e.Alm.text, QStringLiteral("No alarms are active"));
+}
+
+void tst_status_engines::dbaseFailure()
+{
+    Rig r;
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(!e.Form_Load(QStringLiteral("7"), r.dir.filePath(QStringLiteral("missing.db"))));
+    QCOMPARE(r.op.last().title, QStringLiteral("Data Base Invalid"));
+    QCOMPARE(r.link.dbaseErrors, 1);
+    QVERIFY(r.link.writes.isEmpty());
+}
+
+QTEST_GUILESS_MAIN(tst_status_engines)
+#include "tst_status_engines.moc"
