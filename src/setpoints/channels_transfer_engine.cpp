@@ -1,0 +1,497 @@
+#include "setpoints/channels_transfer_engine.h"
+
+#include "link/commands.h"
+#include "link/link.h"
+#include "link/link_globals.h"
+#include "setpoints/audit_trail.h"
+#include "setpoints/catalogue.h"
+#include "setpoints/channel_record_codec.h"
+#include "setpoints/instrument_schema.h"
+#include "setpoints/instrument_store.h"
+#include "setpoints/upload_progress_engine.h"
+
+using channel_record::RecordValue;
+using channel_record::ValueKind;
+
+namespace {
+
+constexpr int kLastWire = catalogue::kChannels - 1;
+constexpr int kUploadRetries = 6;
+constexpr int kDownloadTries = 6;
+constexpr int kDownloadMismatches = 3;
+
+QString uploadedLabel(int channel)
+{
+    return QStringLiteral("Channel %1 of 216 Channels Uploaded").arg(channel);
+}
+
+QString downloadedLabel(int channel)
+{
+    return QStringLiteral("Channel %1 of 216 Channels Downloaded").arg(channel);
+}
+
+void restart(Timer& t, int ms)
+{
+    t.stop();
+    t.start(ms);
+}
+
+} // namespace
+
+channels_transfer_engine::channels_transfer_engine(Link& link, Clock& clock, Operator& op, OpenViews& views,
+                                                   InstrumentStore& store, upload_progress_engine& upload,
+                                                   QObject* parent)
+    : QObject(parent), writer(commands::Sender::Channels, link, clock, op, views, store),
+      command_prefix(commands::prefix(commands::Sender::Channels)), Timer5(clock), Timer6(clock),
+      m_link(link), m_clock(clock), m_op(op), m_store(store), m_upload(upload)
+{
+    connect(&Timer5, &Timer::timeout, this, &channels_transfer_engine::Timer5_Timer);
+    connect(&Timer6, &Timer::timeout, this, &channels_transfer_engine::Timer6_Timer);
+    connect(&writer, &WritePath::changed, this, &channels_transfer_engine::changed);
+    Recordset& sp = m_store.setpointsTable();
+    if (sp.AbsolutePosition() < 0)
+        sp.MoveFirst();
+}
+
+channels_transfer_engine::~channels_transfer_engine() = default;
+
+void channels_transfer_engine::setAuditTrail(AuditTrail* audit)
+{
+    m_audit = audit;
+    writer.setAuditTrail(audit);
+}
+
+void channels_transfer_engine::setChannel(int channel)
+{
+    m_store.setpointsTable().setAbsolutePosition(qBound(1, channel, catalogue::kChannels) - 1);
+}
+
+int channels_transfer_engine::channel()
+{
+    return m_store.setpointsTable().AbsolutePosition() + 1;
+}
+
+int channels_transfer_engine::wireChannelOfRow()
+{
+    return m_store.setpointsTable().value(catalogue::kChannelNumberField).toInt() - 1;
+}
+
+void channels_transfer_engine::setButtons(bool enabled)
+{
+    uploadall.enabled = uploadchan.enabled = downloadall.enabled = downloadchan.enabled = enabled;
+}
+
+void channels_transfer_engine::setForms(bool enabled)
+{
+    forms_enabled = enabled;
+}
+
+// ---------------------------------------------------------------------------
+// Upload
+
+void channels_transfer_engine::uploadall_Click()
+{
+    uploading = true;
+    writer.button_pressed = true;
+    LinkGlobals& g = m_link.globals();
+    if (!g.link_up)
+        return;
+    m_running = true;
+    m_failed = false;
+    upload_retries = 0;
+    upload_all = true;
+    setForms(false);
+    m_link.Output(commands::framed(commands::Sender::Channels, "c"));
+    setButtons(false);
+    m_upload.Show(QStringLiteral("Upload"), uploadedLabel(0),
+                  QStringLiteral("Up Loading all Channels from the Glacinor"), 0);
+    // The instrument takes longer for the first record.
+    Timer5.start(g.speed_factor * 6000);
+    Timer6.start(g.speed_factor * 5000);
+    emit changed();
+}
+
+void channels_transfer_engine::uploadchan_Click()
+{
+    uploading = true;
+    writer.button_pressed = true;
+    LinkGlobals& g = m_link.globals();
+    if (!g.link_up)
+        return;
+    m_running = true;
+    m_failed = false;
+    upload_all = false;
+    setForms(false);
+    const int wire = wireChannelOfRow();
+    m_link.Output(commands::framed(commands::Sender::Channels, "a" + QByteArray::number(wire) + ','));
+    sent_to_glacinor = QString::number(wire) + QLatin1Char(',');
+    setButtons(false);
+    Timer5.start(g.speed_factor * (wire == 0 ? 5000 : 4000));
+    emit changed();
+}
+
+void channels_transfer_engine::timeRepair(int field, int channel)
+{
+    const catalogue::TimeGroup* group = catalogue::timeGroupOf(field);
+    if (!group)
+        return;
+    int index = 0;
+    while (index < group->count && group->fields[std::size_t(index)] != field)
+        ++index;
+    if (index == 0)
+        return;
+    // The last defrost time is held against defrost time 5.
+    const int against = field == 42 ? 39 : group->fields[std::size_t(index - 1)];
+    Recordset& sp = m_store.setpointsTable();
+    double now = 0, before = 0;
+    if (!catalogue::numericValue(sp.value(field), &now) || !catalogue::numericValue(sp.value(against), &before)
+        || now >= before)
+        return;
+    const QString name = QString::fromLatin1(group->name);
+    const QString lower = name.left(1).toLower() + name.mid(1);
+    const QString setTo = group->function == 17 ? name : lower;
+    const int k = index + 1;
+    m_op.message(QStringLiteral("Wrong Time Value"),
+                 {QStringLiteral("%1 %2 was earlier than %3 %4,").arg(name).arg(k).arg(lower).arg(k - 1),
+                  QStringLiteral("%1 %2 has been set to the same as %3 %4,").arg(name).arg(k).arg(setTo).arg(k - 1),
+                  QStringLiteral("The Glacinor (Channel No. %1) must be updated and or changed to its correct time")
+                      .arg(channel + 1)});
+    sp.setValue(field, sp.value(against));
+}
+
+void channels_transfer_engine::sin_chan_up_load()
+{
+    return_string = m_link.test3Text();
+    Timer5.stop();
+    int invalid = 0;
+    const int channel = channel_record::recordChannel(return_string);
+    if (channel < 0) {
+        channelInvalid();
+        return;
+    }
+    const double version = m_link.globals().versionNumber();
+    return_string = channel_record::widenedRecord(return_string, channel, version);
+
+    Recordset& sp = m_store.setpointsTable();
+    Recordset& info = m_store.infoTable();
+    saved_position = sp.AbsolutePosition();
+    Store::Transaction tx(m_store.store());
+    sp.setAbsolutePosition(channel);
+    sp.Edit();
+    bool justRepaired = false;
+    for (const RecordValue& v : channel_record::uploadLayout(channel, version)) {
+        const QString text = channel_record::valueText(return_string, v);
+        switch (v.kind) {
+        case ValueKind::Description:
+            sp.setValue(v.field, text);
+            break;
+        case ValueKind::Unchecked: {
+            double n = 0;
+            const bool ok = catalogue::numericValue(text, &n) && n >= channel_record::kUncheckedMin
+                            && n <= channel_record::kUncheckedMax;
+            sp.setValue(v.field, ok ? catalogue::storeNumber(n) : QVariant(channel_record::kUncheckedDefault));
+            if (!ok)
+                invalid = 1;
+            break;
+        }
+        case ValueKind::Checked:
+            info.setAbsolutePosition(v.infoRow);
+            store_checked(sp, info, channel_record::uploadNumber(text), v.field, invalid);
+            break;
+        }
+        const bool checkNow = !justRepaired;
+        justRepaired = false;
+        if (catalogue::timeGroupOf(v.field)) {
+            const QVariant before = sp.value(v.field);
+            timeRepair(v.field, channel);
+            justRepaired = sp.value(v.field) != before;
+        }
+        if (invalid == 1 && checkNow && !justRepaired) {
+            sp.CancelUpdate();
+            invalidValue(channel, v.kind == ValueKind::Unchecked ? -1 - v.field : v.infoRow);
+            return;
+        }
+    }
+    sp.Update();
+    tx.commit();
+    emit channelDone(channel + 1);
+
+    LinkGlobals& g = m_link.globals();
+    if (upload_all) {
+        if (channel < kLastWire) {
+            Timer5.start(g.speed_factor * 4000);
+            Timer6.start(g.speed_factor * 3000);
+            upload_retries = 0;
+            m_link.Output(commands::framed(commands::Sender::Channels, "c"));
+            m_upload.Show(m_upload.Caption.text, uploadedLabel(channel + 1), m_upload.Label2.text, channel);
+            sp.setAbsolutePosition(saved_position);
+            emit changed();
+            return;
+        }
+        // The last record: nothing is to be asked for again.
+        Timer6.stop();
+        m_upload.Unload();
+        setForms(true);
+        finish(true);
+        return;
+    }
+    Timer5.stop();
+    setForms(true);
+    sp.setAbsolutePosition(0);
+    finish(true);
+}
+
+void channels_transfer_engine::invalidValue(int channel, int infoRow)
+{
+    QString name, fallback;
+    if (infoRow >= 0) {
+        name = m_store.info(infoRow, kInfoName).toString();
+        fallback = channel_record::storeText(m_store.info(infoRow, kInfoDefault));
+    } else {
+        // Fields 223..227 have no `info` row: their rule is fixed.
+        name = catalogue::fieldLabel(-1 - infoRow);
+        fallback = QString::number(channel_record::kUncheckedDefault);
+    }
+    m_op.message(QStringLiteral("Update Not Completed"),
+                 {QStringLiteral("The value was not valid from the Glacinor,"),
+                  QStringLiteral("The channel number was %1").arg(channel + 1),
+                  QStringLiteral("The set point was %1,").arg(name),
+                  QStringLiteral("The Default value of %1 was placed in this setpoint on the computer").arg(fallback),
+                  QStringLiteral("Check the set point of this channel for its value, type or function "),
+                  QStringLiteral("YOU MUST CHANGE THIS SET POINT ON THE GLACINOR OR THE COMPUTER SO THAT THE "
+                                 "GLACINOR HAS A VALID VALUE FOR THAT SET POINT."),
+                  QStringLiteral("If changing on the computer the set point may have to be done twice if the "
+                                 "default value is the required value"),
+                  QStringLiteral("ie. place any value into the glacinor then place the required value into the "
+                                 "glacinor")},
+                 Operator::Icon::Exclamation);
+    Timer5.stop();
+    Timer6.stop();
+    setForms(true);
+    m_upload.Unload();
+    m_store.setpointsTable().setAbsolutePosition(0);
+    finish(false);
+}
+
+void channels_transfer_engine::channelInvalid()
+{
+    Timer5.stop();
+    m_op.message(QStringLiteral("Update Not Completed"),
+                 {QStringLiteral("The Channel number was invalid,"), QStringLiteral("Redo the last command")},
+                 Operator::Icon::Exclamation);
+    Timer6.stop();
+    setForms(true);
+    m_upload.Unload();
+    m_store.setpointsTable().setAbsolutePosition(0);
+    finish(false);
+}
+
+void channels_transfer_engine::endOfTransfer()
+{
+    Recordset& sp = m_store.setpointsTable();
+    const int back = saved_position;
+    for (int row = 0; row < catalogue::kChannels && row < sp.RecordCount(); ++row) {
+        sp.setAbsolutePosition(row);
+        Command1_struck[std::size_t(row)] = sp.value(catalogue::kConnectedField).toInt() == 0;
+    }
+    sp.setAbsolutePosition(back >= 0 ? back : 0);
+    emit refillScreen();
+    setButtons(true);
+    m_op.beep();
+}
+
+void channels_transfer_engine::finish(bool ok)
+{
+    m_failed = m_failed || !ok;
+    endOfTransfer();
+    m_running = false;
+    upload_all = false;
+    emit changed();
+    emit transferEnded(!m_failed);
+}
+
+void channels_transfer_engine::Timer6_Timer()
+{
+    Timer6.stop();
+    ++upload_retries;
+    if (upload_retries >= kUploadRetries)
+        return; // Timer5 decides
+    LinkGlobals& g = m_link.globals();
+    m_link.discardInput();
+    m_link.Output(commands::framed(commands::Sender::Channels, "c"));
+    Timer6.start(g.speed_factor * 3000);
+    restart(Timer5, g.speed_factor * 5000);
+}
+
+void channels_transfer_engine::giveUp()
+{
+    Timer5.stop();
+    if (m_audit && m_auditEntry >= 0)
+        m_audit->setOutcome(m_auditEntry, QStringLiteral("V"));
+    m_auditEntry = -1;
+    m_op.message(QStringLiteral("Comunications Failed"),
+                 {QStringLiteral("The comunication with the Glacinor was not successful,"),
+                  QStringLiteral("Re do the last command")},
+                 Operator::Icon::Exclamation);
+    m_link.discardInput();
+    setButtons(true);
+    setForms(true);
+    m_upload.Unload();
+    m_running = false;
+    m_failed = true;
+    upload_all = false;
+    emit changed();
+    emit transferEnded(false);
+}
+
+void channels_transfer_engine::Timer5_Timer()
+{
+    if (!down_running) {
+        giveUp();
+        return;
+    }
+    ++down_timeouts;
+    if (down_timeouts < kDownloadTries) {
+        restart(Timer5, m_link.globals().speed_factor * 5000);
+        sendDownRecord(false);
+        return;
+    }
+    down_running = false;
+    giveUp();
+}
+
+// ---------------------------------------------------------------------------
+// Download
+
+void channels_transfer_engine::sin_chan_down_load()
+{
+    Recordset& sp = m_store.setpointsTable();
+    sp.setAbsolutePosition(down_channel);
+    const QString description = sp.value(catalogue::kDescriptionField).toString();
+    const QString normal = channel_record::normalisedDescription(description, down_channel);
+    if (normal != description) {
+        Store::Transaction tx(m_store.store());
+        sp.Edit();
+        sp.setValue(catalogue::kDescriptionField, normal);
+        sp.Update();
+        tx.commit();
+    }
+    down_record = channel_record::downloadRecord(down_channel, m_link.globals().versionNumber(),
+                                                 [&sp](int field) { return sp.value(field); });
+}
+
+void channels_transfer_engine::sendDownRecord(bool fresh)
+{
+    sin_chan_down_load();
+    m_link.Output(commands::framed(commands::Sender::Channels, "d" + down_record.toLatin1()));
+    sent_to_glacinor = down_record + QStringLiteral("downcheck");
+    if (fresh && m_audit) {
+        if (m_auditEntry >= 0)
+            m_audit->setOutcome(m_auditEntry, QStringLiteral("V"));
+        m_auditEntry = m_audit->begin(QStringLiteral("d"), -1, down_channel + 1, -1, QString(), down_record);
+    }
+}
+
+void channels_transfer_engine::downloadall_Click()
+{
+    writer.button_pressed = true;
+    down_running = true;
+    LinkGlobals& g = m_link.globals();
+    if (!g.link_up)
+        return;
+    m_running = true;
+    m_failed = false;
+    saved_position = m_store.setpointsTable().AbsolutePosition();
+    down_all = true;
+    down_channel = 0;
+    down_timeouts = 0;
+    down_mismatches = 0;
+    setForms(false);
+    setButtons(false);
+    m_upload.Show(QStringLiteral("Download"), downloadedLabel(1),
+                  QStringLiteral("Down Loading all Channels to the Glacinor"), 0);
+    sendDownRecord(true);
+    Timer5.start(g.speed_factor * 5000);
+    Timer6.stop();
+    emit changed();
+}
+
+void channels_transfer_engine::downloadchan_Click()
+{
+    writer.button_pressed = true;
+    LinkGlobals& g = m_link.globals();
+    if (!g.link_up)
+        return;
+    m_running = true;
+    m_failed = false;
+    saved_position = m_store.setpointsTable().AbsolutePosition();
+    down_all = false;
+    down_channel = wireChannelOfRow();
+    setForms(false);
+    setButtons(false);
+    sendDownRecord(true);
+    Timer5.start(g.speed_factor * (down_channel == 0 ? 5000 : 4000));
+    emit changed();
+}
+
+void channels_transfer_engine::down_check()
+{
+    return_string = m_link.test3Text();
+    const bool same = return_string == sent_to_glacinor;
+    const int sf = m_link.globals().speed_factor;
+    if (down_all) {
+        if (same) {
+            m_link.Output(commands::downloadControl());
+            down_mismatches = 0;
+        } else if (++down_mismatches > kDownloadMismatches) {
+            // Hand over to the time-out's count within a moment.
+            restart(Timer5, sf * 200);
+        } else {
+            sendDownRecord(false);
+            restart(Timer5, sf * (down_channel == 0 ? 5000 : 4000));
+        }
+    } else if (same) {
+        m_link.Output(commands::downloadControl());
+        m_op.beep();
+    }
+    if (same && m_audit && m_auditEntry >= 0) {
+        m_audit->setOutcome(m_auditEntry, QStringLiteral("X"));
+        m_auditEntry = -1;
+    }
+    emit changed();
+}
+
+void channels_transfer_engine::done_down()
+{
+    Recordset& sp = m_store.setpointsTable();
+    if (down_all) {
+        emit channelDone(down_channel + 1);
+        ++down_channel;
+        down_mismatches = 0;
+        if (down_channel > kLastWire) {
+            sp.setAbsolutePosition(saved_position >= 0 ? saved_position : 0);
+            setButtons(true);
+            Timer5.stop();
+            setForms(true);
+            m_upload.Unload();
+            down_running = false;
+            m_running = false;
+            emit changed();
+            emit transferEnded(!m_failed);
+            return;
+        }
+        sendDownRecord(true);
+        m_upload.setProgress(down_channel, downloadedLabel(down_channel + 1));
+        restart(Timer5, m_link.globals().speed_factor * 4000);
+        emit changed();
+        return;
+    }
+    emit channelDone(down_channel + 1);
+    setButtons(true);
+    Timer5.stop();
+    setForms(true);
+    sp.setAbsolutePosition(saved_position >= 0 ? saved_position : 0);
+    m_running = false;
+    emit changed();
+    emit transferEnded(!m_failed);
+}

@@ -1,0 +1,108 @@
+#pragma once
+
+// The transfers of the `channels` view without its pixels: the upload of one
+// channel or of all 216 into the store, the download of the store into the
+// instrument, and the checked write of single values (WritePath). The channel
+// editor sits on this engine; q19ctl drives it headless.
+
+#include "link/open_views.h"
+#include "platform/clock.h"
+#include "platform/control_state.h"
+#include "platform/operator.h"
+#include "setpoints/write_path.h"
+
+#include <QObject>
+#include <array>
+
+class Link;
+class InstrumentStore;
+class AuditTrail;
+class upload_progress_engine;
+
+class channels_transfer_engine : public QObject, public ChannelsView {
+    Q_OBJECT
+public:
+    channels_transfer_engine(Link& link, Clock& clock, Operator& op, OpenViews& views,
+                             InstrumentStore& store, upload_progress_engine& upload,
+                             QObject* parent = nullptr);
+    ~channels_transfer_engine() override;
+
+    void setAuditTrail(AuditTrail* audit);
+
+    // The channel on the screen (1..216): the current row of `setpoints`.
+    void setChannel(int channel);
+    int channel();
+
+    // --- the procedures of the form ---
+    void uploadall_Click();
+    void uploadchan_Click();
+    void downloadall_Click();
+    void downloadchan_Click();
+    void sin_chan_up_load() override;
+    void sin_chan_down_load();
+    void down_check() override;
+    void done_down() override;
+    void ret_handel() override { writer.ret_handel(); }
+    void stopTimer5() override { Timer5.stop(); }
+
+    // --- state of the form ---
+    WritePath writer;
+    QByteArray command_prefix;
+    bool uploading = false;
+    bool upload_all = false;
+    int saved_position = 0;
+    int upload_retries = 0;
+    QString return_string;
+    QString sent_to_glacinor;
+    bool down_all = false;
+    bool down_running = false;
+    int down_channel = 0;
+    QString down_record;
+    int down_mismatches = 0;
+    int down_timeouts = 0;
+
+    Timer Timer5; // give up (and in a download of all, try again)
+    Timer Timer6; // ask again for the next record of an upload of all
+
+    ControlState uploadall, uploadchan, downloadall, downloadchan;
+    // The forms ccForm1 and channels: disabled for the whole of a transfer.
+    bool forms_enabled = true;
+    // Command1(n): struck through when channel n+1 is not connected.
+    std::array<bool, 216> Command1_struck{};
+
+    // A transfer started and not ended yet.
+    bool transferRunning() const { return m_running; }
+
+signals:
+    void changed();
+    // A channel's record is stored (upload) or taken (download); 1-based.
+    void channelDone(int channel);
+    // The transfer ended: ok when it went to its end without a failure message.
+    void transferEnded(bool ok);
+    // The screen is to be filled again from the store.
+    void refillScreen();
+
+private:
+    void Timer5_Timer();
+    void Timer6_Timer();
+    void setButtons(bool enabled);
+    void setForms(bool enabled);
+    void endOfTransfer();
+    void finish(bool ok);
+    void invalidValue(int channel, int infoRow);
+    void channelInvalid();
+    void timeRepair(int field, int channel);
+    void sendDownRecord(bool fresh);
+    void giveUp();
+    int wireChannelOfRow();
+
+    Link& m_link;
+    Clock& m_clock;
+    Operator& m_op;
+    InstrumentStore& m_store;
+    upload_progress_engine& m_upload;
+    AuditTrail* m_audit = nullptr;
+    int m_auditEntry = -1;
+    bool m_running = false;
+    bool m_failed = false;
+};
