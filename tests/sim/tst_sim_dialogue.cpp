@@ -409,6 +409,10 @@ void TstSimDialogue::plant()
     QVERIFY2(near21 > 24 * 60 * 3 / 4, QByteArray::number(near21).constData());
     QVERIFY(staged > 0 && staged < 24 * 60);
     QCOMPARE(s.power.records.size(), 30 * 4);
+    // Room 7's open door was logged as a high alarm, once.
+    QCOMPARE(s.alarms.records.size(), 1);
+    QCOMPARE(s.alarms.records.first().channel, 7);
+    QCOMPARE(s.alarms.records.first().time.time().hour(), 10);
     // A higher set point written through "P" is followed.
     rig.say("P5,0,0,1,-100,4," + Eot);
     rig.say("X");

@@ -61,7 +61,8 @@ void TstSimE2e::overPty()
     QProcess sim;
     sim.start(QStringLiteral(Q19SIM_PATH),
               {QStringLiteral("--pty"), QStringLiteral("--version"), QStringLiteral("14"), QStringLiteral("--id"),
-               QStringLiteral("12"), QStringLiteral("--history-hours"), QStringLiteral("2")});
+               QStringLiteral("12"), QStringLiteral("--history-hours"), QStringLiteral("2"),
+               QStringLiteral("--start"), QStringLiteral("2026-03-07 14:05")});
     QVERIFY(sim.waitForStarted(5000));
     QVERIFY(sim.waitForReadyRead(10000));
     const QString path = QString::fromLocal8Bit(sim.readLine()).trimmed();
@@ -119,6 +120,7 @@ void TstSimE2e::modemOverTcp()
     QProcess sim;
     sim.start(QStringLiteral(Q19SIM_PATH), {QStringLiteral("--tcp"), QString::number(port), QStringLiteral("--modem"),
                                             QStringLiteral("--history-hours"), QStringLiteral("0"),
+                                            QStringLiteral("--start"), QStringLiteral("2026-03-07 14:05"),
                                             QStringLiteral("--scenario"), scenario.fileName()});
     QVERIFY(sim.waitForReadyRead(10000));
     QCOMPARE(sim.readLine().trimmed(), QByteArray("127.0.0.1:") + QByteArray::number(port));
