@@ -42,7 +42,8 @@ Instrument:
   --help              This text.
 
 Scenario keys, also control commands on stdin (one per line; the answer
-"ok: ..." or "error: ..." goes to stderr):
+"ok: ..." or "error: ..." goes to stderr). When stdin is a pipe and is
+closed, q19sim ends.
   version = V         Report another firmware version.
   id = N, resets = N  Identity fields.
   speed = N           Plant speed factor.

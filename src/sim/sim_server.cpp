@@ -2,13 +2,16 @@
 
 #include "platform/pty.h"
 
+#include <QCoreApplication>
 #include <QSocketNotifier>
 #include <QTcpServer>
 #include <QTcpSocket>
 
 #include <cerrno>
 #include <cstdio>
+#include <csignal>
 #include <poll.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 namespace sim {
@@ -66,6 +69,11 @@ bool Server::listenTcp(quint16 port, QString* error)
 
 void Server::watchStdin()
 {
+    // Started in the background of a terminal, a read of stdin would stop
+    // the whole simulator; ignored, it fails instead and control is off.
+    std::signal(SIGTTIN, SIG_IGN);
+    struct stat st {};
+    m_stdinIsPipe = ::fstat(STDIN_FILENO, &st) == 0 && (S_ISFIFO(st.st_mode) || S_ISSOCK(st.st_mode));
     m_stdin = new QSocketNotifier(STDIN_FILENO, QSocketNotifier::Read, this);
     connect(m_stdin, &QSocketNotifier::activated, this, &Server::readStdin);
 }
@@ -141,8 +149,15 @@ void Server::readStdin()
 {
     char buf[1024];
     const ssize_t n = ::read(STDIN_FILENO, buf, sizeof buf);
+    if (n < 0 && (errno == EAGAIN || errno == EINTR))
+        return;
+    if (n == 0 && m_stdinIsPipe) {
+        // The program that controls the simulator has gone: so do we.
+        QCoreApplication::quit();
+        return;
+    }
     if (n <= 0) {
-        m_stdin->setEnabled(false); // stdin closed: no more control
+        m_stdin->setEnabled(false); // no control from here on
         return;
     }
     m_stdinLine.append(buf, int(n));

@@ -26,6 +26,8 @@ public:
     // The slave's path, or an empty text with error set.
     QString openPty(QString* error);
     bool listenTcp(quint16 port, QString* error);
+    // Control lines from stdin. When stdin is a pipe and closes, the
+    // simulator ends: whoever started it has let go.
     void watchStdin();
     // Starts the clock; with greet the instrument says "AT&FE0" as it boots.
     void start(bool greet);
@@ -47,6 +49,7 @@ private:
     QTcpSocket* m_client = nullptr;
     QSocketNotifier* m_stdin = nullptr;
     QByteArray m_stdinLine;
+    bool m_stdinIsPipe = false;
 };
 
 } // namespace sim

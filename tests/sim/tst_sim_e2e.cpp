@@ -101,8 +101,10 @@ void TstSimE2e::overPty()
     QCOMPARE(readUntil(fd, "Glacinor").mid(7, 5), QByteArray("00007"));
 
     ::close(fd);
-    sim.kill();
-    sim.waitForFinished(5000);
+    // Closing its control input ends it.
+    sim.closeWriteChannel();
+    QVERIFY(sim.waitForFinished(5000));
+    QCOMPARE(sim.exitStatus(), QProcess::NormalExit);
 }
 
 void TstSimE2e::modemOverTcp()
