@@ -280,7 +280,9 @@ QVariantList templateInfoRow(int row)
         v[kInfoConnectionColumn] = 1; // direct
         break;
     case 5: v[kInfoConnectionColumn] = 0; break;
-    case 6: v[kInfoConnectionColumn] = QStringLiteral("ATZ"); break;
+    // Sits between "ATX4" and "DT": verbose result codes, which are the
+    // words the dispatcher looks for.
+    case 6: v[kInfoConnectionColumn] = QStringLiteral("V1"); break;
     case 7: v[kInfoConnectionColumn] = 0; break; // no flow control
     case kInfoTemperatureIntervalRow:
     case kInfoPressureIntervalRow:

@@ -7,6 +7,9 @@
 #include <QFileInfo>
 #include <QStandardPaths>
 
+#include <csignal>
+#include <sys/prctl.h>
+
 BuiltinSimulatorLine::BuiltinSimulatorLine(std::function<bool()> modemWanted, QObject* parent)
     : Line(parent), m_modemWanted(std::move(modemWanted))
 {
@@ -47,6 +50,9 @@ bool BuiltinSimulatorLine::startSimulator(QString* error)
     if (modem)
         args << QStringLiteral("--modem");
     m_process->setArguments(args);
+    // If the workstation dies without cleaning up, the simulator goes with it
+    // rather than holding its terminal for ever.
+    m_process->setChildProcessModifier([] { ::prctl(PR_SET_PDEATHSIG, SIGTERM); });
     // The simulator's own messages are of no use to the operator.
     m_process->setStandardErrorFile(QProcess::nullDevice());
     m_process->start();
