@@ -1,0 +1,83 @@
+#include "platform/manual_clock.h"
+#include "platform/operator.h"
+#include "setpoints/instrument_schema.h"
+#include "setpoints/instrument_store.h"
+#include "status/frmstatus_engine.h"
+#include "status/frmstatus_view.h"
+#include "status/frmstatusp_engine.h"
+#include "status/frmstatusp_view.h"
+#include "status_test_support.h"
+
+#include <QAbstractButton>
+#include <QLabel>
+#include <QTemporaryDir>
+#include <QTest>
+
+class tst_status_views : public QObject {
+    Q_OBJECT
+private slots:
+    void temperatureViewFollowsEngine();
+    void pressureViewSwapsPanels();
+};
+
+void tst_status_views::temperatureViewFollowsEngine()
+{
+    QTemporaryDir dir;
+    const QString path = dir.filePath(QStringLiteral("t-7.db"));
+    QVERIFY(createInstrumentTemplate(path));
+    InstrumentStore::open(path)->setInfo(0, 7, 3);
+    ManualClock clock;
+    TestLink link(clock);
+    ScriptedOperator op;
+    OpenViews views;
+    frmstatus_engine e(link, clock, op, views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), path));
+    frmstatus_view v(e);
+    v.resize(1366, 768);
+    v.show();
+    auto* temp = v.findChild<QAbstractButton*>(QStringLiteral("Temp_0"));
+    QVERIFY(temp);
+    QVERIFY(!v.findChild<QWidget*>(QStringLiteral("chanframe_1"))->isVisible());
+    e.status_do(ReplyText(2600, "status").num(7 * 3 + 13, 215).str());
+    QTRY_COMPARE(temp->text(), QStringLiteral("21.5"));
+    QVERIFY(temp->isEnabled());
+    // No reply for more than two intervals: the value is dimmed with its age.
+    clock.advance(21000);
+    QTRY_VERIFY(!temp->isEnabled());
+    QVERIFY(temp->toolTip().contains(QStringLiteral("21 s")));
+    // A click on a channel button selects it into the first free row.
+    v.findChild<QAbstractButton*>(QStringLiteral("Command1_9"))->click();
+    QCOMPARE(e.rowChannel(1), 9);
+    QTRY_VERIFY(v.findChild<QWidget*>(QStringLiteral("chanframe_1"))->isVisibleTo(&v));
+    v.findChild<QAbstractButton*>(QStringLiteral("startstatus"))->click();
+    QVERIFY(e.cycle.stopstatus.enabled);
+    QTRY_VERIFY(v.findChild<QWidget*>(QStringLiteral("stopstatus"))->isEnabled());
+}
+
+void tst_status_views::pressureViewSwapsPanels()
+{
+    QTemporaryDir dir;
+    const QString path = dir.filePath(QStringLiteral("t-7.db"));
+    QVERIFY(createInstrumentTemplate(path));
+    ManualClock clock;
+    TestLink link(clock);
+    ScriptedOperator op;
+    OpenViews views;
+    frmstatusp_engine e(link, clock, op, views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), path));
+    frmstatusp_view v(e);
+    v.resize(1366, 768);
+    v.show();
+    ReplyText t(1400, "presss");
+    t.num(20, 350);
+    e.statusp_do(t.str());
+    QTRY_COMPARE(v.findChild<QLabel*>(QStringLiteral("suction_0"))->text(), QStringLiteral("350"));
+    QVERIFY(!v.findChild<QWidget*>(QStringLiteral("Picture1"))->isVisible());
+    v.findChild<QAbstractButton*>(QStringLiteral("dbaseload"))->click();
+    QTRY_VERIFY(v.findChild<QWidget*>(QStringLiteral("Picture1"))->isVisible());
+    QVERIFY(!v.findChild<QWidget*>(QStringLiteral("chanframe_0"))->isVisible());
+    QCOMPARE(v.findChild<QAbstractButton*>(QStringLiteral("dbaseload"))->text(), QStringLiteral("Glacinor Status"));
+}
+
+QTEST_MAIN(tst_status_views)
+#include "tst_status_views.moc"
