@@ -338,10 +338,13 @@ bool WritePath::writeValue(int function, int channel, int subfunction, const QSt
         return false;
     }
     description_fault = 0;
-    const std::optional<Write> w = compose(function, channel, subfunction, screenText, error);
+    QString why;
+    const std::optional<Write> w = compose(function, channel, subfunction, screenText, &why);
+    if (error)
+        *error = why;
     if (!w) {
         description_fault = 0;
-        if (error && error->startsWith(QStringLiteral("Not a valid number")))
+        if (why.startsWith(QStringLiteral("Not a valid number")))
             m_op.message(QStringLiteral("Invalid Value"),
                          {QStringLiteral("Not a valid number, Enter a valid number"),
                           QStringLiteral("The old value will be used.")},
