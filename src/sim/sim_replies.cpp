@@ -132,7 +132,7 @@ QByteArray pressureReply(const InstrumentState& s)
             const int base = 96 * t + 1385;
             const bool fitted = t < comps && (s.field(t, 165) == 8 || s.field(t, 165) == 10);
             const Compressor& c = s.compressor(t);
-            const int bank = 0;
+            const int bank = s.compressorBank(t);
             const int temps[4] = {-50 + int(c.running) * 10, 700 + 50 * c.running, 450, 520};
             const int press[4] = {s.suctionPressure(bank), s.dischargePressure(bank), s.dischargePressure(bank) + 150, s.dischargePressure(bank) + 120};
             auto put = [&](int offset, const QByteArray& text) {

@@ -187,6 +187,17 @@ int InstrumentState::compressorCount() const
     return qMin(n, 27);
 }
 
+int InstrumentState::compressorBank(int i) const
+{
+    int end = 0;
+    for (int b = 0; b < 5; ++b) {
+        end += m_sp[0][155 + b];
+        if (i < end)
+            return b;
+    }
+    return 0;
+}
+
 int InstrumentState::condenserCount() const
 {
     int n = 0;

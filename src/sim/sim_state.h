@@ -143,6 +143,8 @@ public:
     const Compressor& compressor(int i) const { return m_comp[i]; }
     const Condenser& condenser(int i) const { return m_cond[i]; }
     int compressorCount() const;
+    // The suction group (0..4) a compressor (0..26) belongs to.
+    int compressorBank(int i) const;
     int condenserCount() const;
     bool torvanelAlarm(int s, int i) const;
     void setTorvanelAlarm(int s, int i, bool on);

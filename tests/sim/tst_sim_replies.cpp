@@ -223,6 +223,8 @@ void TstSimReplies::pressure()
         // Torvanel 2 (the screw compressor) is fitted, Torvanel 1 is not.
         QCOMPARE(at(r, 1385, 6), QByteArray(" -1000"));
         QCOMPARE(at(r, 96 + 1385 + 24, 6).trimmed().toInt(), s.suctionPressure(0));
+        // Torvanel 7 sits on a compressor of the second group.
+        QCOMPARE(at(r, 96 * 6 + 1385 + 24, 6).trimmed().toInt(), s.suctionPressure(1));
     }
     const QByteArray t = torvanelReply(s);
     QCOMPARE(t.size() - 6, torvanLength);
