@@ -309,9 +309,9 @@ void Instrument::single(char letter)
 {
     const QByteArray kind(1, letter);
     m_counts[kind]++;
+    m_channelCursor = 0;
     switch (letter) {
     case 'K': {
-        m_channelCursor = 0;
         const QByteArray version = m_faults.wrongVersion.value_or(m_state.version());
         const int id = m_faults.wrongId.value_or(m_settings.id);
         reply(kind, identityReply(version, id, m_state.resets(), m_state.now()));
@@ -344,6 +344,7 @@ void Instrument::single(char letter)
 
 void Instrument::key(int index)
 {
+    m_channelCursor = 0;
     m_front.press(m_state, index);
     reply("key", frontReply(m_state, m_front));
 }
@@ -360,6 +361,9 @@ void Instrument::command(const QByteArray& body)
     const QByteArray args = body.mid(1);
     const QByteArray kind = body == "CONNECTK" ? body : QByteArray(1, letter);
     m_counts[kind]++;
+    // "c" walks the channels from the first; any other command ends the walk.
+    if (letter != 'c')
+        m_channelCursor = 0;
     // A new command ends an upload that was still under way.
     if (m_chain != LogKind::None && letter != 'D' && letter != 'b' && letter != 'S' && letter != 'U'
         && letter != 's' && letter != 'u')
@@ -368,7 +372,6 @@ void Instrument::command(const QByteArray& body)
     switch (letter) {
     case 'C':
         if (body == "CONNECTK") {
-            m_channelCursor = 0;
             const QByteArray version = m_faults.wrongVersion.value_or(m_state.version());
             const int id = m_faults.wrongId.value_or(m_settings.id);
             reply(kind, identityReply(version, id, m_state.resets(), m_state.now()));

@@ -113,10 +113,17 @@ void TstSimDialogue::splitArrival()
     const QByteArray id = rig.say("ECTK" + Eot);
     QCOMPARE(id.size(), 47);
     QCOMPARE(id.mid(7, 5), QByteArray("00012"));
-    // "c" walks the channels from the first after an identity.
+    // "c" walks the channels from the first; any other command starts the
+    // walk again, the last channel too.
     QVERIFY(rig.say("c" + Eot).startsWith("     0"));
     QVERIFY(rig.say("c" + Eot).startsWith("     1"));
     rig.say("K");
+    QVERIFY(rig.say("c" + Eot).startsWith("     0"));
+    QVERIFY(rig.say("c" + Eot).startsWith("     1"));
+    rig.say("F" + Eot);
+    QVERIFY(rig.say("c" + Eot).startsWith("     0"));
+    for (int i = 1; i < 216; ++i)
+        rig.say("c" + Eot);
     QVERIFY(rig.say("c" + Eot).startsWith("     0"));
 }
 
