@@ -5,7 +5,8 @@
 #include <QString>
 
 // The directory q-19.db: one table, one row per instrument. ID holds digits
-// only (the instrument reports it as a number); ID and Name are each unique.
+// only (the instrument reports it as a number); ID and Name are each unique,
+// which the directory engine checks before a row is written.
 namespace Table1 {
 inline const QString TableName = QStringLiteral("Table1");
 enum Field { ID, Name, Address, townstate, phoneno, glacinorphone, FieldCount };
