@@ -13,6 +13,10 @@
 #include "shell/frmsplash_view.h"
 #include "shell/mdiform1_view.h"
 #include "shell/widget_icons.h"
+#include "status/frmstatus_engine.h"
+#include "status/frmstatus_view.h"
+#include "status/frmstatusp_engine.h"
+#include "status/frmstatusp_view.h"
 
 #include <QApplication>
 #include <QCommandLineParser>
@@ -94,6 +98,25 @@ int main(int argc, char* argv[])
     QObject::connect(&directory, &ccForm1_directory::instrumentSelected, &line, &ccForm1_engine::setInstrument);
     QObject::connect(&directory, &ccForm1_directory::propertySettingsWanted, &line,
                      &ccForm1_engine::LoadPropertySettings);
+
+    // The views this workstation has. Each window owns its engine; a view
+    // whose data base fails has said so and started dbase_error, and still
+    // stands until that closes everything.
+    const auto storeOf = [&folder, &directory] { return folder.instrumentFile(directory.openId()); };
+    mainWindow.registerView(ViewId::status, [&](OpenViews& v) -> QWidget* {
+        auto* engine = new frmstatus_engine(line, clock, op, v);
+        engine->Form_Load(directory.openId(), storeOf());
+        auto* view = new frmstatus_view(*engine);
+        engine->setParent(view);
+        return view;
+    });
+    mainWindow.registerView(ViewId::statusp, [&](OpenViews& v) -> QWidget* {
+        auto* engine = new frmstatusp_engine(line, clock, op, v);
+        engine->Form_Load(directory.openId(), storeOf());
+        auto* view = new frmstatusp_view(*engine);
+        engine->setParent(view);
+        return view;
+    });
 
     mainWindow.engine().setLink(&line);
     mainWindow.engine().MDIForm_Load();

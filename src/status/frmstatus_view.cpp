@@ -118,11 +118,15 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     top->addWidget(interval);
     top->addWidget(intervalText);
     top->addStretch();
-    top->addWidget(now);
-    top->addWidget(start);
-    top->addWidget(stop);
-    top->addWidget(print);
     v->addLayout(top);
+    // The commands get a row of their own, so the view fits a 1366 pixel screen.
+    auto* commands = new QHBoxLayout;
+    commands->addWidget(now);
+    commands->addWidget(start);
+    commands->addWidget(stop);
+    commands->addWidget(print);
+    commands->addStretch();
+    v->addLayout(commands);
     auto* ceased = box(QStringLiteral("Text1"), page, 14, true);
     v->addWidget(ceased);
 

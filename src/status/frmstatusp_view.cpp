@@ -82,9 +82,13 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     top->addWidget(new QLabel(QStringLiteral("Update every"), this));
     top->addWidget(interval);
     top->addStretch();
-    for (QPushButton* b : {now, start, stop, panel, print})
-        top->addWidget(b);
     v->addLayout(top);
+    // The commands get a row of their own, so the view fits a 1366 pixel screen.
+    auto* commands = new QHBoxLayout;
+    for (QPushButton* b : {now, start, stop, panel, print})
+        commands->addWidget(b);
+    commands->addStretch();
+    v->addLayout(commands);
     auto* ceased = box(QStringLiteral("Text1"), this, true);
     auto* ceased2 = box(QStringLiteral("Text2"), this, true);
     v->addWidget(ceased);
