@@ -1,0 +1,453 @@
+// q19ctl setpoints upload|download|diff, q19ctl set and q19ctl audit: the
+// transfers of the channels view and the checked write, without windows.
+
+#include "ctl/ctl_command.h"
+#include "link/ccform1_engine.h"
+#include "platform/clock.h"
+#include "platform/operator.h"
+#include "platform/settings.h"
+#include "platform/store.h"
+#include "setpoints/audit_trail.h"
+#include "setpoints/catalogue.h"
+#include "setpoints/channel_record_codec.h"
+#include "setpoints/channels_transfer_engine.h"
+#include "setpoints/instrument_store.h"
+#include "setpoints/upload_progress_engine.h"
+
+#include <QEventLoop>
+#include <QFile>
+#include <QFileInfo>
+#include <QJsonArray>
+#include <QJsonDocument>
+#include <QJsonObject>
+#include <QTemporaryDir>
+#include <QTimer>
+#include <cstdio>
+
+namespace {
+
+// Long enough for all 216 channels at the slowest line speed.
+constexpr int kTransferCapMs = 60 * 60 * 1000;
+constexpr int kConnectCapMs = 120000;
+
+void err(const QString& text)
+{
+    std::fprintf(stderr, "q19ctl: %s\n", text.toLocal8Bit().constData());
+}
+
+void out(const QString& text)
+{
+    std::fputs(text.toLocal8Bit().constData(), stdout);
+    std::fflush(stdout);
+}
+
+// The directory row of the ID (else the first one) and its modem number.
+QString instrumentId(const CtlOptions& o, QString* phone)
+{
+    QString id = o.id;
+    const QString directory = o.dataDir + QStringLiteral("/q-19.db");
+    if (!QFileInfo::exists(directory))
+        return id;
+    std::unique_ptr<Store> dir = Store::open(directory);
+    std::unique_ptr<Recordset> rows = dir ? dir->openRecordset(QStringLiteral("Table1")) : nullptr;
+    if (!rows)
+        return id;
+    for (bool more = rows->MoveFirst(); more && !rows->atEOF(); more = rows->MoveNext()) {
+        const QString rowId = rows->value(QStringLiteral("ID")).toString().trimmed();
+        if (id.isEmpty())
+            id = rowId;
+        if (rowId == id) {
+            *phone = rows->value(QStringLiteral("glacinorphone")).toString().trimmed();
+            break;
+        }
+    }
+    return id;
+}
+
+QString storePath(const CtlOptions& o, const QString& id)
+{
+    return o.dataDir + QStringLiteral("/t-%1.db").arg(id);
+}
+
+// One connection to the instrument with the channels view open on a store.
+class Session {
+public:
+    explicit Session(const CtlOptions& o) : m_options(o), m_op(o.yes) {}
+
+    ~Session()
+    {
+        if (m_link && m_globals.link_up)
+            m_link->hangUp();
+        m_views.channels_open = false;
+        m_views.channels = nullptr;
+    }
+
+    HeadlessOperator& op() { return m_op; }
+    SystemClock& clock() { return m_clock; }
+    LinkGlobals& globals() { return m_globals; }
+    channels_transfer_engine& channels() { return *m_channels; }
+    InstrumentStore& store() { return *m_store; }
+    AuditTrail* audit() { return m_audit.get(); }
+    QString id() const { return m_id; }
+
+    // Opens the instrument's store (or the one given) and connects.
+    int open(const QString& storeFile = {})
+    {
+        QString phone;
+        m_id = instrumentId(m_options, &phone);
+        if (m_id.isEmpty()) {
+            err(QStringLiteral("no instrument: give --id ID"));
+            return ctl::Usage;
+        }
+        const QString path = storeFile.isEmpty() ? storePath(m_options, m_id) : storeFile;
+        QString error;
+        m_store = InstrumentStore::open(path, &error);
+        if (!m_store) {
+            err(QStringLiteral("%1: %2").arg(path, error));
+            return ctl::Failure;
+        }
+        m_audit = AuditTrail::open(m_store->store(), m_clock, &error);
+        if (!m_audit) {
+            err(QStringLiteral("no audit trail: %1").arg(error));
+            return ctl::Failure;
+        }
+        m_link = std::make_unique<ccForm1_engine>(m_clock, m_op, m_settings, m_views, m_globals);
+        m_link->setInstrument(m_id, phone, &m_store->infoTable());
+        m_link->LoadPropertySettings();
+        if (!m_options.port.isEmpty() && !m_link->setCommPort(m_options.port, &error)) {
+            err(error);
+            return ctl::Failure;
+        }
+        const bool modem = m_link->Option2[0].value.toBool();
+        if (modem && phone.isEmpty()) {
+            err(QStringLiteral("instrument %1 has no modem number in the directory").arg(m_id));
+            return ctl::Failure;
+        }
+        m_channels = std::make_unique<channels_transfer_engine>(*m_link, m_clock, m_op, m_views, *m_store,
+                                                                m_upload);
+        m_channels->setAuditTrail(m_audit.get());
+        m_views.channels = m_channels.get();
+        m_views.channels_open = true;
+
+        QEventLoop loop;
+        bool accepted = false;
+        const qsizetype before = m_op.messages().size();
+        QObject::connect(m_link.get(), &ccForm1_engine::identityAccepted, &loop, [&] {
+            accepted = true;
+            QTimer::singleShot(0, &loop, &QEventLoop::quit);
+        });
+        QObject::connect(m_link.get(), &ccForm1_engine::changed, &loop, [&] {
+            if (m_op.messages().size() > before)
+                QTimer::singleShot(0, &loop, &QEventLoop::quit);
+        });
+        QTimer::singleShot(kConnectCapMs, &loop, &QEventLoop::quit);
+        ctl::progress(modem ? QStringLiteral("Dialling %1 on %2").arg(phone, m_link->CommPort())
+                            : QStringLiteral("Connecting on %1").arg(m_link->CommPort()));
+        if (modem)
+            m_link->dial_num_Click();
+        else
+            m_link->Command3_Click();
+        if (!accepted && m_op.messages().size() == before)
+            loop.exec();
+        QObject::disconnect(m_link.get(), nullptr, &loop, nullptr);
+        if (!accepted || !m_globals.link_up) {
+            err(QStringLiteral("no connection to instrument %1").arg(m_id));
+            return ctl::Failure;
+        }
+        ctl::progress(QStringLiteral("Connected: version %1").arg(m_globals.instrument_version));
+        return ctl::Ok;
+    }
+
+    // Runs a transfer to its end; true when it ended without a failure.
+    bool transfer(const std::function<void()>& start, const QString& verb)
+    {
+        QEventLoop loop;
+        bool ok = false, ended = false;
+        QObject::connect(m_channels.get(), &channels_transfer_engine::channelDone, &loop, [&](int channel) {
+            ctl::progress(QStringLiteral("Channel %1 of 216 %2").arg(channel).arg(verb));
+        });
+        QObject::connect(m_channels.get(), &channels_transfer_engine::transferEnded, &loop, [&](bool good) {
+            ok = good;
+            ended = true;
+            QTimer::singleShot(0, &loop, &QEventLoop::quit);
+        });
+        QTimer::singleShot(kTransferCapMs, &loop, &QEventLoop::quit);
+        start();
+        if (!ended && m_channels->transferRunning())
+            loop.exec();
+        QObject::disconnect(m_channels.get(), nullptr, &loop, nullptr);
+        return ended && ok;
+    }
+
+private:
+    const CtlOptions& m_options;
+    SystemClock m_clock;
+    HeadlessOperator m_op;
+    MemorySettings m_settings;
+    OpenViews m_views;
+    LinkGlobals m_globals;
+    QString m_id;
+    std::unique_ptr<InstrumentStore> m_store;
+    std::unique_ptr<AuditTrail> m_audit;
+    std::unique_ptr<ccForm1_engine> m_link;
+    upload_progress_engine m_upload;
+    std::unique_ptr<channels_transfer_engine> m_channels;
+};
+
+// --all or --channel N: 0 for all, the channel, or -1 on a usage error.
+int parseScope(const QStringList& args, int from)
+{
+    const QStringList rest = args.mid(from);
+    if (rest == QStringList{QStringLiteral("--all")})
+        return 0;
+    if (rest.size() == 2 && rest[0] == QLatin1String("--channel")) {
+        bool ok = false;
+        const int n = rest[1].toInt(&ok);
+        if (ok && n >= 1 && n <= catalogue::kChannels)
+            return n;
+    }
+    return -1;
+}
+
+bool upload(Session& s, int channel)
+{
+    return s.transfer(
+        [&] {
+            if (channel == 0) {
+                s.channels().uploadall_Click();
+            } else {
+                s.channels().setChannel(channel);
+                s.channels().uploadchan_Click();
+            }
+        },
+        QStringLiteral("uploaded"));
+}
+
+int differences(const CtlOptions& o, int channel)
+{
+    // The instrument's set points go into a scratch copy of the store; the
+    // store itself is only read.
+    QString phone;
+    const QString id = instrumentId(o, &phone);
+    if (id.isEmpty()) {
+        err(QStringLiteral("no instrument: give --id ID"));
+        return ctl::Usage;
+    }
+    QTemporaryDir scratchDir;
+    const QString scratch = scratchDir.filePath(QStringLiteral("scratch.db"));
+    if (!QFile::copy(storePath(o, id), scratch)) {
+        err(QStringLiteral("cannot copy %1").arg(storePath(o, id)));
+        return ctl::Failure;
+    }
+    QString error;
+    std::unique_ptr<InstrumentStore> offline = InstrumentStore::open(storePath(o, id), &error);
+    if (!offline) {
+        err(error);
+        return ctl::Failure;
+    }
+    Session s(o);
+    if (const int rc = s.open(scratch))
+        return rc;
+    if (!upload(s, channel))
+        return ctl::Failure;
+
+    const double version = s.globals().versionNumber();
+    QJsonArray rows;
+    QString text;
+    int count = 0;
+    for (int wire = 0; wire < catalogue::kChannels; ++wire) {
+        if (channel && wire != channel - 1)
+            continue;
+        for (int field : channel_record::downloadFields(wire, version)) {
+            QString mine = channel_record::storeText(offline->setpoint(wire, field));
+            const QString theirs = channel_record::storeText(s.store().setpoint(wire, field));
+            if (field == catalogue::kDescriptionField)
+                mine = channel_record::normalisedDescription(mine, wire);
+            if (mine == theirs)
+                continue;
+            ++count;
+            const QString label = catalogue::fieldLabel(field);
+            rows.append(QJsonObject{{"channel", wire + 1}, {"field", field}, {"name", label},
+                                    {"instrument", theirs}, {"store", mine}});
+            text += QStringLiteral("channel %1 field %2 (%3): %4 -> %5\n")
+                        .arg(wire + 1).arg(field).arg(label, theirs, mine);
+        }
+    }
+    if (o.json)
+        out(QString::fromUtf8(QJsonDocument(rows).toJson(QJsonDocument::Compact)) + QLatin1Char('\n'));
+    else
+        out(text.isEmpty() ? QStringLiteral("no differences\n") : text);
+    ctl::progress(QStringLiteral("%1 values would change").arg(count));
+    return ctl::Ok;
+}
+
+int setpoints(const CtlOptions& given)
+{
+    // --yes may also follow the command's own arguments.
+    CtlOptions o = given;
+    if (o.args.removeAll(QStringLiteral("--yes")) > 0)
+        o.yes = true;
+    const QString sub = o.args.value(0);
+    const int channel = parseScope(o.args, 1);
+    if ((sub != QLatin1String("upload") && sub != QLatin1String("download") && sub != QLatin1String("diff"))
+        || (channel < 0 && sub != QLatin1String("diff"))
+        || (sub == QLatin1String("diff") && o.args.size() > 1 && channel < 0)) {
+        err(QStringLiteral("usage: setpoints upload (--all | --channel N) | download (--all | --channel N) "
+                           "| diff [--all | --channel N]"));
+        return ctl::Usage;
+    }
+    if (sub == QLatin1String("diff"))
+        return differences(o, qMax(0, channel));
+
+    Session s(o);
+    if (sub == QLatin1String("download")) {
+        const QString what = channel ? QStringLiteral("channel %1").arg(channel) : QStringLiteral("all channels");
+        if (s.op().message(QStringLiteral("Download"),
+                           {QStringLiteral("Are you sure !,"),
+                            QStringLiteral("This will write the set points of %1 into the Glacinor.").arg(what)},
+                           Operator::Icon::Question, Operator::Buttons::OkCancel)
+            != Operator::Answer::Ok) {
+            err(QStringLiteral("download cancelled: give --yes"));
+            return ctl::Failure;
+        }
+    }
+    if (const int rc = s.open())
+        return rc;
+    bool ok = false;
+    if (sub == QLatin1String("upload")) {
+        ok = upload(s, channel);
+    } else {
+        ok = s.transfer(
+            [&] {
+                if (channel == 0) {
+                    s.channels().downloadall_Click();
+                } else {
+                    s.channels().setChannel(channel);
+                    s.channels().downloadchan_Click();
+                }
+            },
+            QStringLiteral("downloaded"));
+    }
+    return ok ? ctl::Ok : ctl::Failure;
+}
+
+int set(const CtlOptions& o)
+{
+    if (o.args.size() != 4) {
+        err(QStringLiteral("usage: set FUNCTION CHANNEL SUBFUNCTION VALUE"));
+        return ctl::Usage;
+    }
+    bool ok1 = false, ok2 = false, ok3 = false;
+    const int function = o.args[0].toInt(&ok1);
+    const int channel = o.args[1].toInt(&ok2);
+    const int sub = o.args[2].toInt(&ok3);
+    if (!ok1 || !ok2 || !ok3 || channel < 1 || channel > catalogue::kChannels) {
+        err(QStringLiteral("FUNCTION, CHANNEL (1-216) and SUBFUNCTION are numbers"));
+        return ctl::Usage;
+    }
+    Session s(o);
+    if (const int rc = s.open())
+        return rc;
+    WritePath& w = s.channels().writer;
+    QString error;
+    const std::optional<WritePath::Write> composed = w.compose(function, channel, sub, o.args[3], &error);
+    w.description_fault = 0;
+    if (!composed) {
+        err(error);
+        return ctl::Usage;
+    }
+    if (const catalogue::Function* f = catalogue::findFunction(function);
+        f && f->rangeChecked && f->unit != catalogue::Unit::Text && !composed->fields.isEmpty()) {
+        const bool bankTemp = s.store().setpoint(0, 218 + sub).toInt() == 1;
+        const int controlType = s.store().setpoint(channel - 1, 209).toInt();
+        const qint64 v = composed->fields.first().second.toLongLong();
+        if (!catalogue::inRange(*f, v, bankTemp, controlType)) {
+            const catalogue::Range r = catalogue::rangeOf(*f, bankTemp, controlType);
+            err(QStringLiteral("%1 is outside %2 to %3 (store units)").arg(v).arg(r.min).arg(r.max));
+            return ctl::Usage;
+        }
+    }
+    QEventLoop loop;
+    int result = -1;
+    QObject::connect(&w, &WritePath::confirmed, &loop, [&] {
+        result = ctl::Ok;
+        QTimer::singleShot(0, &loop, &QEventLoop::quit);
+    });
+    QObject::connect(&w, &WritePath::abandoned, &loop, [&] {
+        result = ctl::Failure;
+        QTimer::singleShot(0, &loop, &QEventLoop::quit);
+    });
+    if (!w.writeValue(function, channel, sub, o.args[3], &error)) {
+        if (error.isEmpty()) {
+            ctl::progress(QStringLiteral("The value is already %1: nothing sent").arg(o.args[3]));
+            return ctl::Ok;
+        }
+        err(error);
+        return ctl::Failure;
+    }
+    ctl::progress(QStringLiteral("Sent %1, waiting for the echo").arg(QString::fromLatin1(composed->body)));
+    if (result < 0)
+        loop.exec();
+    if (result == ctl::Ok)
+        out(QStringLiteral("confirmed: %1\n").arg(w.sent_to_glacinor));
+    return result;
+}
+
+int audit(const CtlOptions& o)
+{
+    if (!o.args.isEmpty()) {
+        err(QStringLiteral("audit takes no arguments"));
+        return ctl::Usage;
+    }
+    QString phone;
+    const QString id = instrumentId(o, &phone);
+    if (id.isEmpty()) {
+        err(QStringLiteral("no instrument: give --id ID"));
+        return ctl::Usage;
+    }
+    QString error;
+    std::unique_ptr<InstrumentStore> store = InstrumentStore::open(storePath(o, id), &error);
+    if (!store) {
+        err(error);
+        return ctl::Failure;
+    }
+    SystemClock clock;
+    std::unique_ptr<AuditTrail> trail = AuditTrail::open(store->store(), clock, &error);
+    if (!trail) {
+        err(error);
+        return ctl::Failure;
+    }
+    QJsonArray rows;
+    QString text;
+    for (const AuditEntry& e : trail->entries()) {
+        const QString when = e.time.toString(QStringLiteral("yyyy-MM-dd hh:mm:ss"));
+        const QString outcome = e.outcome.isEmpty() ? QStringLiteral("-") : e.outcome;
+        rows.append(QJsonObject{{"time", when}, {"kind", e.kind}, {"function", e.function},
+                                {"channel", e.channel}, {"subfunction", e.subfunction},
+                                {"old", e.oldValue}, {"new", e.newValue}, {"outcome", outcome}});
+        if (e.kind == QLatin1String("d"))
+            text += QStringLiteral("%1 download channel %2: %3 [%4]\n").arg(when).arg(e.channel).arg(e.newValue, outcome);
+        else
+            text += QStringLiteral("%1 P%2 channel %3 sub %4: %5 -> %6 [%7]\n")
+                        .arg(when).arg(e.function).arg(e.channel).arg(e.subfunction)
+                        .arg(e.oldValue, e.newValue, outcome);
+    }
+    out(o.json ? QString::fromUtf8(QJsonDocument(rows).toJson(QJsonDocument::Compact)) + QLatin1Char('\n') : text);
+    return ctl::Ok;
+}
+
+const ctl::Registration setpointsCommand(
+    {QStringLiteral("setpoints"),
+     QStringLiteral("upload (--all | --channel N) | download (--all | --channel N) | diff [--channel N]"),
+     QStringLiteral("upload the set points into the store, download the store into the instrument, or list "
+                    "what a download would change"),
+     setpoints});
+const ctl::Registration setCommand({QStringLiteral("set"), QStringLiteral("FUNCTION CHANNEL SUBFUNCTION VALUE"),
+                                    QStringLiteral("write one set point (screen units) to the store and the "
+                                                   "instrument, checked by its echo"),
+                                    set});
+const ctl::Registration auditCommand({QStringLiteral("audit"), QString(),
+                                      QStringLiteral("list the writes sent to the instrument and their outcome"),
+                                      audit});
+
+} // namespace
