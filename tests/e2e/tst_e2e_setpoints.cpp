@@ -1,0 +1,202 @@
+// The set point transfers against q19sim on a pseudo-terminal: the real
+// SerialLine, the real dispatcher, the real store.
+
+#include "link/ccform1_engine.h"
+#include "setpoints/audit_trail.h"
+#include "setpoints/catalogue.h"
+#include "setpoints/channel_record_codec.h"
+#include "setpoints/channels_transfer_engine.h"
+#include "setpoints/instrument_schema.h"
+#include "setpoints/instrument_store.h"
+#include "setpoints/upload_progress_engine.h"
+
+#include <QProcess>
+#include <QSignalSpy>
+#include <QTemporaryDir>
+#include <QtTest>
+
+namespace {
+
+struct Sim {
+    QProcess process;
+    QString path;
+
+    bool start(const QString& version)
+    {
+        process.setProgram(QStringLiteral(Q19SIM_PATH));
+        process.setArguments({"--pty", "--id", "1", "--version", version});
+        process.start();
+        if (!process.waitForStarted(5000))
+            return false;
+        for (int i = 0; i < 50 && !process.canReadLine(); ++i)
+            process.waitForReadyRead(100);
+        path = QString::fromLocal8Bit(process.readLine()).trimmed();
+        // A real instrument answers after a few milliseconds; an instant answer
+        // would race the dispatcher's discard of the input behind each reply.
+        control("delay = 3");
+        return path.startsWith(QLatin1Char('/'));
+    }
+    void control(const QByteArray& line)
+    {
+        process.write(line + '\n');
+        process.waitForBytesWritten(1000);
+        process.waitForReadyRead(500);
+    }
+    ~Sim()
+    {
+        process.kill();
+        process.waitForFinished(2000);
+    }
+};
+
+// The workstation: a line, a store and the channels view open on it.
+struct Workstation {
+    SystemClock clock;
+    ScriptedOperator op;
+    MemorySettings settings;
+    OpenViews views;
+    LinkGlobals globals;
+    std::unique_ptr<InstrumentStore> store;
+    std::unique_ptr<AuditTrail> audit;
+    std::unique_ptr<ccForm1_engine> link;
+    upload_progress_engine upload;
+    std::unique_ptr<channels_transfer_engine> channels;
+
+    bool open(const QString& dbPath, const QString& port)
+    {
+        if (!createInstrumentTemplate(dbPath) || !(store = InstrumentStore::open(dbPath)))
+            return false;
+        audit = AuditTrail::open(store->store(), clock);
+        link = std::make_unique<ccForm1_engine>(clock, op, settings, views, globals);
+        link->setInstrument(QStringLiteral("1"), QString(), nullptr);
+        link->setCommPort(port);
+        link->Option2_Click(1);
+        channels = std::make_unique<channels_transfer_engine>(*link, clock, op, views, *store, upload);
+        channels->setAuditTrail(audit.get());
+        views.channels = channels.get();
+        views.channels_open = true;
+        QSignalSpy accepted(link.get(), &ccForm1_engine::identityAccepted);
+        link->Command3_Click();
+        return accepted.wait(5000);
+    }
+    ~Workstation()
+    {
+        views.channels_open = false;
+        views.channels = nullptr;
+        if (link)
+            link->Command6_Click();
+    }
+    bool run(const std::function<void()>& start, int ms = 60000)
+    {
+        QSignalSpy ended(channels.get(), &channels_transfer_engine::transferEnded);
+        start();
+        if (ended.isEmpty() && !ended.wait(ms))
+            return false;
+        return ended.first().first().toBool();
+    }
+};
+
+QString cell(InstrumentStore& s, int wire, int field)
+{
+    return channel_record::storeText(s.setpoint(wire, field));
+}
+
+} // namespace
+
+class TestE2ESetpoints : public QObject {
+    Q_OBJECT
+private slots:
+    void uploadChangeDownloadUploadAgain_data();
+    void uploadChangeDownloadUploadAgain();
+    void writeConfirmedAndWriteAbandoned();
+};
+
+void TestE2ESetpoints::uploadChangeDownloadUploadAgain_data()
+{
+    QTest::addColumn<QString>("version");
+    QTest::newRow("7") << "7";
+    QTest::newRow("14") << "14";
+}
+
+void TestE2ESetpoints::uploadChangeDownloadUploadAgain()
+{
+    QFETCH(QString, version);
+    Sim sim;
+    QVERIFY(sim.start(version));
+    QTemporaryDir dir;
+    Workstation ws;
+    QVERIFY(ws.open(dir.filePath(QStringLiteral("t-1.db")), sim.path));
+    QCOMPARE(ws.globals.instrument_version, version);
+
+    QVERIFY2(ws.run([&] { ws.channels->uploadall_Click(); }), qPrintable(ws.op.last().toText()));
+    QVERIFY2(ws.op.messages().isEmpty(), qPrintable(ws.op.last().toText()));
+
+    // Change values of several kinds and places, then send everything down.
+    const double v = version.toDouble();
+    struct Change {
+        int wire, field;
+        QVariant value;
+    };
+    QList<Change> changes = {{0, 2, 55},     {3, 14, 120},          {99, 53, 33},
+                             {150, 19, -200}, {215, 25, "Dock16"},   {0, 83, 2},
+                             {26, 166, 7},    {11, 169, 2},          {6, 25, QString()}};
+    if (v >= 14)
+        changes.append({31, 227, 42});
+    for (const Change& c : changes)
+        QVERIFY(ws.store->setSetpoint(c.wire, c.field, c.value));
+    QVERIFY2(ws.run([&] { ws.channels->downloadall_Click(); }), qPrintable(ws.op.last().toText()));
+    QCOMPARE(cell(*ws.store, 6, 25), QStringLiteral("Ch 7  "));
+
+    // A second workstation's copy, uploaded afresh, holds what went down.
+    QTemporaryDir dir2;
+    Workstation again;
+    ws.link->Command6_Click();
+    QVERIFY(again.open(dir2.filePath(QStringLiteral("t-1.db")), sim.path));
+    QVERIFY(again.run([&] { again.channels->uploadall_Click(); }));
+    for (int wire = 0; wire < catalogue::kChannels; ++wire)
+        for (const channel_record::RecordValue& rv : channel_record::uploadLayout(wire, v))
+            QVERIFY2(cell(*again.store, wire, rv.field) == cell(*ws.store, wire, rv.field),
+                     qPrintable(QStringLiteral("wire %1 field %2: %3 against %4")
+                                    .arg(wire).arg(rv.field)
+                                    .arg(cell(*again.store, wire, rv.field), cell(*ws.store, wire, rv.field))));
+    for (const Change& c : changes)
+        if (c.field != 25)
+            QCOMPARE(cell(*again.store, c.wire, c.field), channel_record::storeText(c.value));
+    QCOMPARE(cell(*again.store, 215, 25), QStringLiteral("Dock16"));
+}
+
+void TestE2ESetpoints::writeConfirmedAndWriteAbandoned()
+{
+    Sim sim;
+    QVERIFY(sim.start(QStringLiteral("14")));
+    QTemporaryDir dir;
+    Workstation ws;
+    QVERIFY(ws.open(dir.filePath(QStringLiteral("t-1.db")), sim.path));
+    WritePath& w = ws.channels->writer;
+
+    QSignalSpy confirmed(&w, &WritePath::confirmed);
+    QVERIFY(w.writeValue(5, 4, 1, QStringLiteral("-18.5")));
+    QVERIFY(confirmed.wait(5000));
+
+    sim.control("garble = P:2");
+    QSignalSpy abandoned(&w, &WritePath::abandoned);
+    QVERIFY(w.writeValue(47, 4, 0, QStringLiteral("77")));
+    QVERIFY(abandoned.wait(5000));
+    QCOMPARE(ws.op.last().title, QStringLiteral("Update Not Completed"));
+    QCOMPARE(cell(*ws.store, 3, 53), QStringLiteral("77"));
+
+    // The instrument holds the confirmed value and not the abandoned one.
+    ws.channels->setChannel(4);
+    QVERIFY(ws.run([&] { ws.channels->uploadchan_Click(); }));
+    QCOMPARE(cell(*ws.store, 3, 3), QStringLiteral("-185"));
+    QVERIFY(cell(*ws.store, 3, 53) != QStringLiteral("77"));
+
+    const QList<AuditEntry> audit = ws.audit->entries();
+    QCOMPARE(audit.size(), 2);
+    QCOMPARE(audit[0].outcome, QStringLiteral("X"));
+    QCOMPARE(audit[1].outcome, QStringLiteral("V"));
+    QCOMPARE(audit[1].function, 47);
+}
+
+QTEST_MAIN(TestE2ESetpoints)
+#include "tst_e2e_setpoints.moc"
