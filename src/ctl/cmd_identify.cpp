@@ -2,6 +2,7 @@
 // identity and print what it reports.
 
 #include "ctl/ctl_command.h"
+#include "directory/data_folder.h"
 #include "link/ccform1_engine.h"
 #include "platform/clock.h"
 #include "platform/operator.h"
@@ -50,8 +51,9 @@ Instrument findInstrument(const CtlOptions& o)
             }
         }
     }
-    const QString file = o.dataDir + QStringLiteral("/t-%1.db").arg(inst.id);
-    if (!inst.id.isEmpty() && QFileInfo::exists(file)) {
+    // Only a well-formed ID names a file, so no ID can reach outside the folder.
+    const QString file = DataFolder(o.dataDir).instrumentFile(inst.id);
+    if (!file.isEmpty() && QFileInfo::exists(file)) {
         inst.store = Store::open(file);
         if (inst.store)
             inst.info = inst.store->openRecordset(QStringLiteral("info"));
@@ -68,6 +70,10 @@ int identify(const CtlOptions& o)
     Instrument inst = findInstrument(o);
     if (inst.id.isEmpty()) {
         std::fprintf(stderr, "q19ctl: no instrument: give --id ID\n");
+        return ctl::Usage;
+    }
+    if (!DataFolder::isValidId(inst.id)) {
+        std::fprintf(stderr, "q19ctl: an instrument ID is a number from 1 to 99999\n");
         return ctl::Usage;
     }
 

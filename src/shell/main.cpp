@@ -96,8 +96,15 @@ int main(int argc, char* argv[])
     lineEngine = &line;
     ccForm1_directory directory(folder, op);
     QObject::connect(&directory, &ccForm1_directory::instrumentSelected, &line, &ccForm1_engine::setInstrument);
-    QObject::connect(&directory, &ccForm1_directory::propertySettingsWanted, &line,
-                     &ccForm1_engine::LoadPropertySettings);
+    QObject::connect(&directory, &ccForm1_directory::propertySettingsWanted, &line, [&line] {
+        line.no_computer_link = false;
+        line.LoadPropertySettings();
+    });
+    // No call may start while a new instrument is half typed in.
+    QObject::connect(&directory, &ccForm1_directory::addingChanged, &line, [&line](bool adding) {
+        line.dial_num.enabled = !adding;
+        emit line.changed();
+    });
 
     // The views this workstation has. Each window owns its engine; a view
     // whose data base fails has said so and started dbase_error, and still
