@@ -5,6 +5,7 @@
 #include "platform/operator.h"
 #include "setpoints/catalogue.h"
 #include "setpoints/instrument_store.h"
+#include "setpoints/view_store.h"
 #include "status/status_codec.h"
 
 namespace {
@@ -74,12 +75,8 @@ bool frmstatus_engine::Form_Load(const QString& instrumentId, const QString& sto
 {
     m_views.status_open = true;
     cycle.Text10[0].text = instrumentId;
-    QString why;
-    m_store = InstrumentStore::open(storePath, &why);
+    m_store = openViewStore(storePath, m_op, m_link);
     if (!m_store) {
-        m_op.message(QStringLiteral("Data Base Invalid"),
-                     {QStringLiteral("There was an error in this Glacinors data base,")});
-        m_link.startDbaseError();
         emit changed();
         return false;
     }

@@ -4,6 +4,7 @@
 #include "link/link_globals.h"
 #include "platform/operator.h"
 #include "setpoints/instrument_store.h"
+#include "setpoints/view_store.h"
 
 namespace {
 
@@ -130,12 +131,8 @@ bool frmstatusp_engine::Form_Load(const QString& instrumentId, const QString& st
 {
     m_views.statusp_open = true;
     cycle.Text10[0].text = instrumentId;
-    QString why;
-    m_store = InstrumentStore::open(storePath, &why);
+    m_store = openViewStore(storePath, m_op, m_link);
     if (!m_store) {
-        m_op.message(QStringLiteral("Data Base Invalid"),
-                     {QStringLiteral("There was an error in this Glacinors data base,")});
-        m_link.startDbaseError();
         emit changed();
         return false;
     }
