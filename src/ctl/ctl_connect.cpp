@@ -1,0 +1,121 @@
+#include "ctl/ctl_connect.h"
+
+#include "directory/data_folder.h"
+
+#include <QEventLoop>
+#include <QFileInfo>
+#include <QTimer>
+#include <cstdio>
+
+namespace ctl {
+
+namespace {
+
+// Long enough for a modem call (50 s without an answer, then the messages).
+constexpr int kGiveUpMs = 120000;
+
+} // namespace
+
+Connection::Connection(const CtlOptions& options) : op(options.yes), m_options(options) {}
+
+Connection::~Connection()
+{
+    if (m_engine)
+        m_engine->hangUp();
+}
+
+int Connection::open(const QString& command)
+{
+    m_id = m_options.id;
+    const QString directory = m_options.dataDir + QStringLiteral("/q-19.db");
+    if (QFileInfo::exists(directory)) {
+        if (std::unique_ptr<Store> dir = Store::open(directory)) {
+            if (std::unique_ptr<Recordset> rows = dir->openRecordset(QStringLiteral("Table1"))) {
+                for (bool more = rows->MoveFirst(); more && !rows->atEOF(); more = rows->MoveNext()) {
+                    const QString rowId = rows->value(QStringLiteral("ID")).toString().trimmed();
+                    if (m_id.isEmpty())
+                        m_id = rowId;
+                    if (rowId == m_id) {
+                        m_phone = rows->value(QStringLiteral("glacinorphone")).toString().trimmed();
+                        break;
+                    }
+                }
+            }
+        }
+    }
+    if (m_id.isEmpty()) {
+        std::fprintf(stderr, "q19ctl: no instrument: give --id ID\n");
+        return Usage;
+    }
+    if (!DataFolder::isValidId(m_id)) {
+        std::fprintf(stderr, "q19ctl: an instrument ID is a number from 1 to 99999\n");
+        return Usage;
+    }
+    // Only a well-formed ID names a file, so no ID can reach outside the folder.
+    const QString file = DataFolder(m_options.dataDir).instrumentFile(m_id);
+    if (!file.isEmpty() && QFileInfo::exists(file)) {
+        m_store = Store::open(file);
+        if (m_store)
+            m_info = m_store->openRecordset(QStringLiteral("info"));
+    }
+
+    m_engine = std::make_unique<ccForm1_engine>(clock, op, m_settings, views, globals);
+    ccForm1_engine& engine = *m_engine;
+    engine.setInstrument(m_id, m_phone, m_info.get());
+    engine.LoadPropertySettings();
+    // Without stored settings the line is direct: a modem needs a number.
+    if (!m_info)
+        engine.Option2_Click(1);
+    if (!m_options.port.isEmpty()) {
+        QString error;
+        if (!engine.setCommPort(m_options.port, &error)) {
+            std::fprintf(stderr, "q19ctl: %s\n", error.toLocal8Bit().constData());
+            return Failure;
+        }
+    }
+    const bool modem = engine.Option2[0].value.toBool();
+    if (modem && m_phone.isEmpty()) {
+        std::fprintf(stderr, "q19ctl: instrument %s has no modem number in the directory\n",
+                     m_id.toLocal8Bit().constData());
+        return Failure;
+    }
+
+    const qsizetype messagesBefore = op.messages().size();
+    QObject::connect(&engine, &ccForm1_engine::identityAccepted, &engine, [this] { m_accepted = true; });
+    progress(modem ? QStringLiteral("Dialling %1 on %2").arg(m_phone, engine.CommPort())
+                   : QStringLiteral("Connecting on %1").arg(engine.CommPort()));
+    if (modem)
+        engine.dial_num_Click();
+    else
+        engine.Command3_Click();
+    // A message ends the dialogue.
+    const bool ended = waitFor([&] { return m_accepted || op.messages().size() > messagesBefore; }, kGiveUpMs);
+    if (!ended) {
+        std::fprintf(stderr, "q19ctl: %s: no answer in %d s\n", command.toLocal8Bit().constData(),
+                     kGiveUpMs / 1000);
+        return Failure;
+    }
+    return m_accepted && op.messages().size() == messagesBefore ? Ok : Failure;
+}
+
+bool Connection::waitFor(const std::function<bool()>& done, int ms)
+{
+    if (done())
+        return true;
+    QEventLoop loop;
+    QTimer check;
+    // The engines report by their state, not by one signal: look often.
+    QObject::connect(&check, &QTimer::timeout, &loop, [&] {
+        if (done())
+            loop.quit();
+    });
+    check.start(10);
+    QTimer giveUp;
+    giveUp.setSingleShot(true);
+    QObject::connect(&giveUp, &QTimer::timeout, &loop, &QEventLoop::quit);
+    giveUp.start(ms);
+    loop.exec();
+    return done();
+}
+
+} // namespace ctl
