@@ -15,6 +15,7 @@
 class Link;
 class Operator;
 class InstrumentStore;
+class Printer;
 
 class frmstatus_engine : public QObject, public TemperatureStatusView {
     Q_OBJECT
@@ -74,6 +75,8 @@ public:
     void Cmdselchan_Click();
     void Cmdseldis_Click();
     void Temp_Click(int index);
+    // The report of the 20 rows as they show now.
+    void printgraph_Click(Printer& Printer);
     void Changechannels();
     void com_chan_visable();
     void chanBanks();

@@ -1,6 +1,7 @@
 #include "status/frmstatus_view.h"
 
 #include "platform/widget_control_state.h"
+#include "platform/widget_printer.h"
 #include "status/frmstatus_engine.h"
 
 #include <QGridLayout>
@@ -265,6 +266,11 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     connect(now, &QPushButton::clicked, &c, &StatusCycle::nowstatus_Click);
     connect(start, &QPushButton::clicked, &c, &StatusCycle::startstatus_Click);
     connect(stop, &QPushButton::clicked, &c, &StatusCycle::stopstatus_Click);
+    // The report is shown first, so that it can be seen without paper; the
+    // preview prints it or saves it as a PDF file.
+    connect(print, &QPushButton::clicked, this, [this] {
+        printPreview(this, m_e.printgraph.text, [this](Printer& p) { m_e.printgraph_Click(p); });
+    });
     connect(interval, &QSpinBox::valueChanged, this, [this](int value) {
         if (m_e.cycle.UpDown1.value.toInt() != value)
             m_e.cycle.UpDown1_Change(value);
@@ -297,9 +303,6 @@ void frmstatus_view::afterRefresh()
                 w->setVisible(false);
         }
     }
-    findChild<QWidget*>(QStringLiteral("printgraph"))->setEnabled(false);
-    findChild<QWidget*>(QStringLiteral("printgraph"))
-        ->setToolTip(QStringLiteral("Printing the current status is not available in this version"));
     if (!m_e.setPointCard) {
         for (int i = 0; i < frmstatus_engine::Rows; ++i)
             findChild<QWidget*>(QStringLiteral("Temp_%1").arg(i))

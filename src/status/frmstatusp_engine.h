@@ -16,6 +16,7 @@
 class Link;
 class Operator;
 class InstrumentStore;
+class Printer;
 
 class frmstatusp_engine : public QObject, public PressureStatusView {
     Q_OBJECT
@@ -99,6 +100,8 @@ public:
     void send_torvanel_request();
     void show_torvanel_data();
     void show_alarm_words();
+    // The report of the banks and of the compressors and condensers shown.
+    void printgraph_Click(Printer& Printer);
 
 signals:
     void changed();

@@ -1,5 +1,6 @@
 #include "status/frmstatusp_view.h"
 
+#include "platform/widget_printer.h"
 #include "status/frmstatusp_engine.h"
 
 #include <QGridLayout>
@@ -253,6 +254,10 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     connect(now, &QPushButton::clicked, &c, &StatusCycle::nowstatus_Click);
     connect(start, &QPushButton::clicked, &c, &StatusCycle::startstatus_Click);
     connect(stop, &QPushButton::clicked, &c, &StatusCycle::stopstatus_Click);
+    // Shown first; the preview prints the report or saves it as a PDF file.
+    connect(print, &QPushButton::clicked, this, [this] {
+        printPreview(this, m_e.printgraph.text, [this](Printer& p) { m_e.printgraph_Click(p); });
+    });
     connect(panel, &QPushButton::clicked, &e, &frmstatusp_engine::dbaseload_Click);
     connect(interval, &QSpinBox::valueChanged, this, [this](int value) {
         if (m_e.cycle.UpDown1.value.toInt() != value)
@@ -286,7 +291,4 @@ void frmstatusp_view::afterRefresh()
                 w->setVisible(false);
     }
     m_plant->setVisible(!m_e.Picture1.visible);
-    auto* print = findChild<QWidget*>(QStringLiteral("printgraph"));
-    print->setEnabled(false);
-    print->setToolTip(QStringLiteral("Printing the current status is not available in this version"));
 }

@@ -4,6 +4,7 @@
 #include "link/link_globals.h"
 #include "link/open_views.h"
 #include "platform/operator.h"
+#include "platform/printer.h"
 #include "setpoints/instrument_schema.h"
 #include "setpoints/instrument_store.h"
 #include "status/status_codec.h"
@@ -394,4 +395,18 @@ void StatusCycle::staleTick()
     m_wasStale = now;
     m_lastAge = age;
     emit changed();
+}
+
+void StatusCycle::printHead(Printer& printer, const QString& title) const
+{
+    printer.setFont({QStringLiteral("Arial"), ReportFontSize, false});
+    printer.line(title);
+    printer.endLine();
+    printer.line(QStringLiteral("Glacinor ID  ") + Text10[0].text);
+    printer.endLine();
+    const QDateTime now = m_clock.now();
+    printer.line(QStringLiteral("Printed at  ") + now.toString(QStringLiteral("dd/MM/yyyy")) + QStringLiteral("   ") +
+                 now.toString(QStringLiteral("hh:mm:ss")) + QStringLiteral("      Glacinor Date and Time  ") +
+                 Text10[2].text);
+    printer.endLine();
 }

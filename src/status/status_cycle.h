@@ -17,6 +17,7 @@
 
 class Link;
 class Operator;
+class Printer;
 struct OpenViews;
 class StatusCycleView;
 class InstrumentStore;
@@ -112,6 +113,11 @@ public:
 
     // Seconds in Text10(1).
     int intervalSeconds() const;
+
+    // The head every status report starts with: the title, the instrument's
+    // id, when it was printed and the instrument's date and time.
+    void printHead(Printer& printer, const QString& title) const;
+    static constexpr double ReportFontSize = 7;
 
     // --- stale data ---
     // True when a reply has come and the last one is older than two intervals.
