@@ -60,6 +60,7 @@ private slots:
     void temperatureReport();
     void pressureReport();
     void temperatureReportAsPdf();
+    void pressureReportAsPdf();
 };
 
 void tst_status_reports::temperatureReport_data()
@@ -219,6 +220,37 @@ void tst_status_reports::temperatureReportAsPdf()
     QVERIFY2(row.contains(QStringLiteral("Bank 1")) && row.trimmed().endsWith(QStringLiteral("YES")), qPrintable(row));
     // The 20 rows fit on one page.
     QCOMPARE(all.count(QLatin1Char('\f')), 1);
+}
+
+void tst_status_reports::pressureReportAsPdf()
+{
+    const QString pdftotext = QStandardPaths::findExecutable(QStringLiteral("pdftotext"));
+    if (pdftotext.isEmpty())
+        QSKIP("pdftotext is not installed");
+    Rig r;
+    r.store->setSetpoint(0, 155, 4);
+    r.store->setSetpoint(0, 165, 7); // eight stages: the widest row
+    r.store->setSetpoint(0, 160, 2);
+    r.store->setSetpoint(0, 83, 5);
+    frmstatusp_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    ReplyText t(1400, QStringLiteral("presss"));
+    t.put(1, "09/03/2026 14:05:12");
+    e.statusp_do(t.str());
+
+    const QString folder = qEnvironmentVariable("Q19_REPORT_DIR", r.dir.path());
+    const QString pdf = folder + QStringLiteral("/frmstatusp-report.pdf");
+    QVERIFY(printToPdf(pdf, [&](Printer& p) { e.printgraph_Click(p); }));
+    QProcess text;
+    text.start(pdftotext, {QStringLiteral("-layout"), pdf, QStringLiteral("-")});
+    QVERIFY(text.waitForFinished(20000));
+    const QStringList lines = QString::fromUtf8(text.readAllStandardOutput()).split(QLatin1Char('\n'));
+    const QStringList heads = lines.filter(QStringLiteral("Compressor No."));
+    QCOMPARE(heads.size(), 1);
+    QCOMPARE(heads[0].simplified(), QStringLiteral("Compressor No. Bank No. Equal'z Sol Stage 1 Stage 2 Stage 3 "
+                                                   "Stage 4 Stage 5 Stage 6 Stage 7 Stage 8"));
+    QCOMPARE(lines.filter(QRegularExpression(QStringLiteral("^1\\s+Bank 1(\\s+OFF){8}\\s*$"))).size(), 1);
+    QCOMPARE(lines.filter(QStringLiteral("Bank No. 5")).size(), 1);
 }
 
 QTEST_MAIN(tst_status_reports)
