@@ -9,7 +9,10 @@
 #include "status_test_support.h"
 
 #include <QAbstractButton>
+#include <QApplication>
 #include <QLabel>
+#include <QPrintPreviewDialog>
+#include <QTimer>
 #include <QTemporaryDir>
 #include <QTest>
 
@@ -52,6 +55,23 @@ void tst_status_views::temperatureViewFollowsEngine()
     v.findChild<QAbstractButton*>(QStringLiteral("startstatus"))->click();
     QVERIFY(e.cycle.stopstatus.enabled);
     QTRY_VERIFY(v.findChild<QWidget*>(QStringLiteral("stopstatus"))->isEnabled());
+
+    // The report opens in a preview, from which it goes to paper or a PDF file.
+    auto* print = v.findChild<QAbstractButton*>(QStringLiteral("printgraph"));
+    QVERIFY(print->isEnabled());
+    QString previewTitle;
+    QTimer::singleShot(0, this, [&] {
+        if (auto* preview = qobject_cast<QPrintPreviewDialog*>(QApplication::activeModalWidget())) {
+            previewTitle = preview->windowTitle();
+            if (qEnvironmentVariableIsSet("Q19_REPORT_DIR")) {
+                preview->resize(1000, 760);
+                preview->grab().save(qEnvironmentVariable("Q19_REPORT_DIR") + QStringLiteral("/preview.png"));
+            }
+            preview->reject();
+        }
+    });
+    print->click();
+    QCOMPARE(previewTitle, QStringLiteral("Print Current Status"));
 }
 
 void tst_status_views::pressureViewSwapsPanels()
