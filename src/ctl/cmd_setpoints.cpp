@@ -2,6 +2,8 @@
 // transfers of the channels view and the checked write, without windows.
 
 #include "ctl/ctl_command.h"
+#include "ctl/ctl_connect.h"
+#include "directory/data_folder.h"
 #include "link/ccform1_engine.h"
 #include "platform/clock.h"
 #include "platform/operator.h"
@@ -28,7 +30,6 @@ namespace {
 
 // Long enough for all 216 channels at the slowest line speed.
 constexpr int kTransferCapMs = 60 * 60 * 1000;
-constexpr int kConnectCapMs = 120000;
 
 void err(const QString& text)
 {
@@ -45,6 +46,8 @@ void out(const QString& text)
 QString instrumentId(const CtlOptions& o, QString* phone)
 {
     QString id = o.id;
+    // A new data folder is made as at the program's first start.
+    DataFolder(o.dataDir).ensure();
     const QString directory = o.dataDir + QStringLiteral("/q-19.db");
     if (!QFileInfo::exists(directory))
         return id;
@@ -57,7 +60,8 @@ QString instrumentId(const CtlOptions& o, QString* phone)
         if (id.isEmpty())
             id = rowId;
         if (rowId == id) {
-            *phone = rows->value(QStringLiteral("glacinorphone")).toString().trimmed();
+            if (phone)
+                *phone = rows->value(QStringLiteral("glacinorphone")).toString().trimmed();
             break;
         }
     }
@@ -66,130 +70,81 @@ QString instrumentId(const CtlOptions& o, QString* phone)
 
 QString storePath(const CtlOptions& o, const QString& id)
 {
-    return o.dataDir + QStringLiteral("/t-%1.db").arg(id);
+    return DataFolder(o.dataDir).instrumentFile(id);
 }
 
 // One connection to the instrument with the channels view open on a store.
 class Session {
 public:
-    explicit Session(const CtlOptions& o) : m_options(o), m_op(o.yes) {}
+    explicit Session(const CtlOptions& o) : m_options(o), m_conn(o) {}
 
     ~Session()
     {
-        if (m_link && m_globals.link_up)
-            m_link->hangUp();
-        m_views.channels_open = false;
-        m_views.channels = nullptr;
+        m_conn.views.channels_open = false;
+        m_conn.views.channels = nullptr;
     }
 
-    HeadlessOperator& op() { return m_op; }
-    SystemClock& clock() { return m_clock; }
-    LinkGlobals& globals() { return m_globals; }
+    HeadlessOperator& op() { return m_conn.op; }
+    LinkGlobals& globals() { return m_conn.globals; }
     channels_transfer_engine& channels() { return *m_channels; }
     InstrumentStore& store() { return *m_store; }
-    AuditTrail* audit() { return m_audit.get(); }
-    QString id() const { return m_id; }
 
-    // Opens the instrument's store (or the one given) and connects.
-    int open(const QString& storeFile = {})
+    // Connects, then opens the instrument's store (or the one given) under
+    // the channels view.
+    int open(const QString& command, const QString& storeFile = {})
     {
-        QString phone;
-        m_id = instrumentId(m_options, &phone);
-        if (m_id.isEmpty()) {
-            err(QStringLiteral("no instrument: give --id ID"));
-            return ctl::Usage;
-        }
-        const QString path = storeFile.isEmpty() ? storePath(m_options, m_id) : storeFile;
+        if (const int rc = m_conn.open(command))
+            return rc;
+        const QString path = storeFile.isEmpty() ? storePath(m_options, m_conn.id()) : storeFile;
         QString error;
         m_store = InstrumentStore::open(path, &error);
         if (!m_store) {
             err(QStringLiteral("%1: %2").arg(path, error));
             return ctl::Failure;
         }
-        m_audit = AuditTrail::open(m_store->store(), m_clock, &error);
+        m_audit = AuditTrail::open(m_store->store(), m_conn.clock, &error);
         if (!m_audit) {
             err(QStringLiteral("no audit trail: %1").arg(error));
             return ctl::Failure;
         }
-        m_link = std::make_unique<ccForm1_engine>(m_clock, m_op, m_settings, m_views, m_globals);
-        m_link->setInstrument(m_id, phone, &m_store->infoTable());
-        m_link->LoadPropertySettings();
-        if (!m_options.port.isEmpty() && !m_link->setCommPort(m_options.port, &error)) {
-            err(error);
-            return ctl::Failure;
-        }
-        const bool modem = m_link->Option2[0].value.toBool();
-        if (modem && phone.isEmpty()) {
-            err(QStringLiteral("instrument %1 has no modem number in the directory").arg(m_id));
-            return ctl::Failure;
-        }
-        m_channels = std::make_unique<channels_transfer_engine>(*m_link, m_clock, m_op, m_views, *m_store,
-                                                                m_upload);
+        m_channels = std::make_unique<channels_transfer_engine>(m_conn.engine(), m_conn.clock, m_conn.op,
+                                                                m_conn.views, *m_store, m_upload);
         m_channels->setAuditTrail(m_audit.get());
-        m_views.channels = m_channels.get();
-        m_views.channels_open = true;
-
-        QEventLoop loop;
-        bool accepted = false;
-        const qsizetype before = m_op.messages().size();
-        QObject::connect(m_link.get(), &ccForm1_engine::identityAccepted, &loop, [&] {
-            accepted = true;
-            QTimer::singleShot(0, &loop, &QEventLoop::quit);
-        });
-        QObject::connect(m_link.get(), &ccForm1_engine::changed, &loop, [&] {
-            if (m_op.messages().size() > before)
-                QTimer::singleShot(0, &loop, &QEventLoop::quit);
-        });
-        QTimer::singleShot(kConnectCapMs, &loop, &QEventLoop::quit);
-        ctl::progress(modem ? QStringLiteral("Dialling %1 on %2").arg(phone, m_link->CommPort())
-                            : QStringLiteral("Connecting on %1").arg(m_link->CommPort()));
-        if (modem)
-            m_link->dial_num_Click();
-        else
-            m_link->Command3_Click();
-        if (!accepted && m_op.messages().size() == before)
-            loop.exec();
-        QObject::disconnect(m_link.get(), nullptr, &loop, nullptr);
-        if (!accepted || !m_globals.link_up) {
-            err(QStringLiteral("no connection to instrument %1").arg(m_id));
-            return ctl::Failure;
-        }
-        ctl::progress(QStringLiteral("Connected: version %1").arg(m_globals.instrument_version));
+        m_conn.views.channels = m_channels.get();
+        m_conn.views.channels_open = true;
+        ctl::progress(QStringLiteral("Connected: version %1").arg(m_conn.globals.instrument_version));
         return ctl::Ok;
     }
 
     // Runs a transfer to its end; true when it ended without a failure.
     bool transfer(const std::function<void()>& start, const QString& verb)
     {
-        QEventLoop loop;
         bool ok = false, ended = false;
-        QObject::connect(m_channels.get(), &channels_transfer_engine::channelDone, &loop, [&](int channel) {
-            ctl::progress(QStringLiteral("Channel %1 of 216 %2").arg(channel).arg(verb));
-        });
-        QObject::connect(m_channels.get(), &channels_transfer_engine::transferEnded, &loop, [&](bool good) {
-            ok = good;
-            ended = true;
-            QTimer::singleShot(0, &loop, &QEventLoop::quit);
-        });
-        QTimer::singleShot(kTransferCapMs, &loop, &QEventLoop::quit);
+        QObject::connect(m_channels.get(), &channels_transfer_engine::channelDone, m_channels.get(),
+                         [verb](int channel) {
+                             ctl::progress(QStringLiteral("Channel %1 of 216 %2").arg(channel).arg(verb));
+                         });
+        QObject::connect(m_channels.get(), &channels_transfer_engine::transferEnded, m_channels.get(),
+                         [&](bool good) {
+                             ok = good;
+                             ended = true;
+                         });
         start();
-        if (!ended && m_channels->transferRunning())
-            loop.exec();
-        QObject::disconnect(m_channels.get(), nullptr, &loop, nullptr);
+        if (m_channels->transferRunning())
+            m_conn.waitFor([&] { return ended; }, kTransferCapMs);
+        QObject::disconnect(m_channels.get(), &channels_transfer_engine::transferEnded, nullptr, nullptr);
+        QObject::disconnect(m_channels.get(), &channels_transfer_engine::channelDone, nullptr, nullptr);
         return ended && ok;
     }
 
+    // Runs the event loop until done() holds.
+    bool waitFor(const std::function<bool()>& done) { return m_conn.waitFor(done, kTransferCapMs); }
+
 private:
     const CtlOptions& m_options;
-    SystemClock m_clock;
-    HeadlessOperator m_op;
-    MemorySettings m_settings;
-    OpenViews m_views;
-    LinkGlobals m_globals;
-    QString m_id;
+    ctl::Connection m_conn;
     std::unique_ptr<InstrumentStore> m_store;
     std::unique_ptr<AuditTrail> m_audit;
-    std::unique_ptr<ccForm1_engine> m_link;
     upload_progress_engine m_upload;
     std::unique_ptr<channels_transfer_engine> m_channels;
 };
@@ -246,7 +201,7 @@ int differences(const CtlOptions& o, int channel)
         return ctl::Failure;
     }
     Session s(o);
-    if (const int rc = s.open(scratch))
+    if (const int rc = s.open(QStringLiteral("setpoints diff"), scratch))
         return rc;
     if (!upload(s, channel))
         return ctl::Failure;
@@ -298,6 +253,7 @@ int setpoints(const CtlOptions& given)
     }
     if (sub == QLatin1String("diff"))
         return differences(o, qMax(0, channel));
+    instrumentId(o, nullptr);
 
     Session s(o);
     if (sub == QLatin1String("download")) {
@@ -311,7 +267,7 @@ int setpoints(const CtlOptions& given)
             return ctl::Failure;
         }
     }
-    if (const int rc = s.open())
+    if (const int rc = s.open(QStringLiteral("setpoints ") + sub))
         return rc;
     bool ok = false;
     if (sub == QLatin1String("upload")) {
@@ -345,8 +301,9 @@ int set(const CtlOptions& o)
         err(QStringLiteral("FUNCTION, CHANNEL (1-216) and SUBFUNCTION are numbers"));
         return ctl::Usage;
     }
+    instrumentId(o, nullptr);
     Session s(o);
-    if (const int rc = s.open())
+    if (const int rc = s.open(QStringLiteral("set")))
         return rc;
     WritePath& w = s.channels().writer;
     QString error;
@@ -367,16 +324,9 @@ int set(const CtlOptions& o)
             return ctl::Usage;
         }
     }
-    QEventLoop loop;
     int result = -1;
-    QObject::connect(&w, &WritePath::confirmed, &loop, [&] {
-        result = ctl::Ok;
-        QTimer::singleShot(0, &loop, &QEventLoop::quit);
-    });
-    QObject::connect(&w, &WritePath::abandoned, &loop, [&] {
-        result = ctl::Failure;
-        QTimer::singleShot(0, &loop, &QEventLoop::quit);
-    });
+    QObject::connect(&w, &WritePath::confirmed, &w, [&] { result = ctl::Ok; });
+    QObject::connect(&w, &WritePath::abandoned, &w, [&] { result = ctl::Failure; });
     if (!w.writeValue(function, channel, sub, o.args[3], &error)) {
         if (error.isEmpty()) {
             ctl::progress(QStringLiteral("The value is already %1: nothing sent").arg(o.args[3]));
@@ -386,8 +336,7 @@ int set(const CtlOptions& o)
         return ctl::Failure;
     }
     ctl::progress(QStringLiteral("Sent %1, waiting for the echo").arg(QString::fromLatin1(composed->body)));
-    if (result < 0)
-        loop.exec();
+    s.waitFor([&] { return result >= 0; });
     if (result == ctl::Ok)
         out(QStringLiteral("confirmed: %1\n").arg(w.sent_to_glacinor));
     return result;

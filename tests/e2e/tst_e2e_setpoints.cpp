@@ -10,6 +10,9 @@
 #include "setpoints/instrument_store.h"
 #include "setpoints/upload_progress_engine.h"
 
+#include <QJsonArray>
+#include <QJsonDocument>
+#include <QJsonObject>
 #include <QProcess>
 #include <QSignalSpy>
 #include <QTemporaryDir>
@@ -109,6 +112,10 @@ private slots:
     void uploadChangeDownloadUploadAgain_data();
     void uploadChangeDownloadUploadAgain();
     void writeConfirmedAndWriteAbandoned();
+#ifdef Q19CTL_PATH
+    void ctlUploadSetDiffDownloadAudit_data();
+    void ctlUploadSetDiffDownloadAudit();
+#endif
 };
 
 void TestE2ESetpoints::uploadChangeDownloadUploadAgain_data()
@@ -197,6 +204,71 @@ void TestE2ESetpoints::writeConfirmedAndWriteAbandoned()
     QCOMPARE(audit[1].outcome, QStringLiteral("V"));
     QCOMPARE(audit[1].function, 47);
 }
+
+#ifdef Q19CTL_PATH
+namespace {
+
+struct CtlRun {
+    int exitCode = -1;
+    QString out;
+    QString err;
+};
+
+CtlRun ctl(const QString& dataDir, const QString& port, const QStringList& args)
+{
+    QProcess p;
+    p.start(QStringLiteral(Q19CTL_PATH), QStringList{"--data-dir", dataDir, "--id", "1", "--port", port} + args);
+    p.waitForFinished(120000);
+    return {p.exitCode(), QString::fromLocal8Bit(p.readAllStandardOutput()),
+            QString::fromLocal8Bit(p.readAllStandardError())};
+}
+
+} // namespace
+
+void TestE2ESetpoints::ctlUploadSetDiffDownloadAudit_data()
+{
+    QTest::addColumn<QString>("version");
+    QTest::newRow("7") << "7";
+    QTest::newRow("14") << "14";
+}
+
+void TestE2ESetpoints::ctlUploadSetDiffDownloadAudit()
+{
+    QFETCH(QString, version);
+    Sim sim;
+    QVERIFY(sim.start(version));
+    QTemporaryDir data; // a new data folder holds the demo instrument 1
+
+    CtlRun r = ctl(data.path(), sim.path, {"setpoints", "upload", "--all"});
+    QVERIFY2(r.exitCode == 0, qPrintable(r.err.right(400)));
+    QVERIFY(r.err.contains(QStringLiteral("Channel 216 of 216 uploaded")));
+    r = ctl(data.path(), sim.path, {"setpoints", "diff"});
+    QCOMPARE(r.out, QStringLiteral("no differences\n"));
+
+    r = ctl(data.path(), sim.path, {"set", "5", "4", "1", "-18.5"});
+    QVERIFY2(r.exitCode == 0, qPrintable(r.err));
+    QCOMPARE(r.out, QStringLiteral("confirmed: 5,3,1,1,-185,4,sret\n"));
+    r = ctl(data.path(), sim.path, {"set", "5", "4", "1", "abc"});
+    QCOMPARE(r.exitCode, 2);
+
+    r = ctl(data.path(), sim.path, {"setpoints", "download", "--all"});
+    QCOMPARE(r.exitCode, 1);
+    r = ctl(data.path(), sim.path, {"setpoints", "download", "--all", "--yes"});
+    QVERIFY2(r.exitCode == 0, qPrintable(r.err.right(400)));
+    r = ctl(data.path(), sim.path, {"setpoints", "diff", "--channel", "4"});
+    QCOMPARE(r.out, QStringLiteral("no differences\n"));
+
+    r = ctl(data.path(), sim.path, {"--json", "audit"});
+    QCOMPARE(r.exitCode, 0);
+    const QJsonArray rows = QJsonDocument::fromJson(r.out.toUtf8()).array();
+    QCOMPARE(rows.size(), 1 + 216);
+    QCOMPARE(rows[0].toObject().value("kind").toString(), QStringLiteral("P"));
+    QCOMPARE(rows[0].toObject().value("new").toString(), QStringLiteral("-185"));
+    QCOMPARE(rows[0].toObject().value("outcome").toString(), QStringLiteral("X"));
+    QCOMPARE(rows[216].toObject().value("channel").toInt(), 216);
+    QCOMPARE(rows[216].toObject().value("outcome").toString(), QStringLiteral("X"));
+}
+#endif
 
 QTEST_MAIN(TestE2ESetpoints)
 #include "tst_e2e_setpoints.moc"
