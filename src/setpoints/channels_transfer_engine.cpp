@@ -151,12 +151,18 @@ void channels_transfer_engine::timeRepair(int field, int channel)
     const QString lower = name.left(1).toLower() + name.mid(1);
     const QString setTo = group->function == 17 ? name : lower;
     const int k = index + 1;
+    // The message holds the transfer: no retry may ask for the next record
+    // while this one is half stored.
+    const bool retrying = Timer6.Enabled();
+    Timer6.stop();
     m_op.message(QStringLiteral("Wrong Time Value"),
                  {QStringLiteral("%1 %2 was earlier than %3 %4,").arg(name).arg(k).arg(lower).arg(k - 1),
                   QStringLiteral("%1 %2 has been set to the same as %3 %4,").arg(name).arg(k).arg(setTo).arg(k - 1),
                   QStringLiteral("The Glacinor (Channel No. %1) must be updated and or changed to its correct time")
                       .arg(channel + 1)});
     sp.setValue(field, sp.value(against));
+    if (retrying)
+        Timer6.start(Timer6.Interval());
 }
 
 void channels_transfer_engine::sin_chan_up_load()
@@ -252,6 +258,9 @@ void channels_transfer_engine::invalidValue(int channel, int infoRow)
         name = catalogue::fieldLabel(-1 - infoRow);
         fallback = QString::number(channel_record::kUncheckedDefault);
     }
+    // Stopped before the message stands, so that no retry runs beneath it.
+    Timer5.stop();
+    Timer6.stop();
     m_op.message(QStringLiteral("Update Not Completed"),
                  {QStringLiteral("The value was not valid from the Glacinor,"),
                   QStringLiteral("The channel number was %1").arg(channel + 1),
@@ -276,10 +285,10 @@ void channels_transfer_engine::invalidValue(int channel, int infoRow)
 void channels_transfer_engine::channelInvalid()
 {
     Timer5.stop();
+    Timer6.stop();
     m_op.message(QStringLiteral("Update Not Completed"),
                  {QStringLiteral("The Channel number was invalid,"), QStringLiteral("Redo the last command")},
                  Operator::Icon::Exclamation);
-    Timer6.stop();
     setForms(true);
     m_upload.Unload();
     m_store.setpointsTable().setAbsolutePosition(0);

@@ -23,6 +23,7 @@ private slots:
     void timeRepairCarriesForward();
     void invalidValueInChannel100EndsUploadOfAll();
     void invalidChannelNumber();
+    void messagesHoldTheUploadOfAll();
     void uploadAllRetriesThenGivesUp();
     void uploadAllEndsAfterChannel216();
     void downloadAllWritesEveryChannelAndNormalisesDescriptions();
@@ -239,6 +240,22 @@ void TestChannelsTransferEngine::invalidChannelNumber()
     QCOMPARE(m_op->last().lines, (QStringList{"The Channel number was invalid,", "Redo the last command"}));
     QCOMPARE(ended.count(), 1);
     QVERIFY(m_engine->downloadchan.enabled);
+}
+
+void TestChannelsTransferEngine::messagesHoldTheUploadOfAll()
+{
+    // A message box lets timers run beneath it; none may ask for a record
+    // while one is half stored.
+    m_op->setWhileShowing([this](const Operator::Message&) { m_clock->advance(60000); });
+    m_engine->uploadall_Click();
+    answerUploads(2, [](int wire, int field) {
+        if (wire == 0 && field >= 6 && field <= 8)
+            return QStringLiteral("600"); // and time 4 at midnight, before them
+        return wire == 1 && field == 2 ? QStringLiteral("  9999") : QString();
+    });
+    QCOMPARE(m_op->titles(), (QStringList{"Wrong Time Value", "Update Not Completed"}));
+    QCOMPARE(m_link->count(QStringLiteral("c")), 2);
+    QVERIFY(!m_engine->transferRunning());
 }
 
 void TestChannelsTransferEngine::uploadAllRetriesThenGivesUp()
