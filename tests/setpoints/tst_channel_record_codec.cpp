@@ -36,6 +36,8 @@ private slots:
     void fillerKeepsLaterPositions();
     void recordChannel_data();
     void recordChannel();
+    void downloadValueCounts_data();
+    void downloadValueCounts();
     void downloadRecord_data();
     void downloadRecord();
     void descriptionNormalised_data();
@@ -202,6 +204,41 @@ void TestChannelRecordCodec::recordChannel()
     QFETCH(QString, record);
     QFETCH(int, channel);
     QCOMPARE(channel_record::recordChannel(record), channel);
+}
+
+void TestChannelRecordCodec::downloadValueCounts_data()
+{
+    QTest::addColumn<double>("version");
+    QTest::addColumn<int>("channel");
+    QTest::addColumn<int>("values");
+    // Values behind the channel number, one column per version:
+    //                       6.5  7    8    8.5  8.6  8.7  9.6  14
+    const QList<QPair<int, QList<int>>> table = {
+        {1, {220, 220, 220, 220, 220, 220, 220, 225}},
+        {27, {77, 77, 77, 77, 77, 77, 77, 82}},
+        {28, {72, 72, 72, 72, 72, 72, 72, 77}},
+        {32, {72, 72, 72, 72, 72, 72, 72, 77}},
+        {33, {72, 72, 72, 72, 72, 72, 72, 77}},
+        {66, {72, 72, 72, 72, 72, 72, 72, 74}},
+        {67, {72, 72, 72, 72, 72, 72, 72, 72}},
+        {100, {72, 72, 72, 72, 72, 72, 72, 72}},
+        {101, {33, 33, 33, 33, 33, 33, 33, 33}},
+        {200, {33, 33, 33, 33, 33, 33, 33, 33}},
+        {201, {12, 12, 12, 12, 12, 12, 12, 12}},
+        {216, {12, 12, 12, 12, 12, 12, 12, 12}},
+    };
+    for (const auto& [channel, counts] : table)
+        for (int i = 0; i < kVersions.size(); ++i)
+            QTest::addRow("v%s ch%d", qPrintable(QString::number(kVersions[i])), channel)
+                << kVersions[i] << channel << counts[i];
+}
+
+void TestChannelRecordCodec::downloadValueCounts()
+{
+    QFETCH(double, version);
+    QFETCH(int, channel);
+    QFETCH(int, values);
+    QCOMPARE(int(downloadFields(channel - 1, version).size()), values);
 }
 
 void TestChannelRecordCodec::downloadRecord_data()
