@@ -208,12 +208,22 @@ bool SerialLine::write(const QByteArray& bytes)
     // Out at once, as the control's Output does; what the driver cannot take
     // yet follows from the event loop.
     m_port.flush();
+    m_wroteSinceArrival = true;
     return true;
 }
 
 void SerialLine::discardInput()
 {
-    if (isOpen())
+    if (!isOpen())
+        return;
+    // What reached the program and was not handled goes.
+    m_port.readAll();
+    // What still waits in the driver goes too, unless something was written
+    // since the last arrival: then it can only be the answer to that write.
+    // On a real line no answer comes back within the moment between a write
+    // and the discard behind it, but a pseudo-terminal or a serial server
+    // answers at once, and that answer must not be thrown away.
+    if (!m_wroteSinceArrival)
         m_port.clear(QSerialPort::Input);
 }
 
@@ -226,6 +236,7 @@ void SerialLine::setDtr(bool on)
 
 void SerialLine::onReadyRead()
 {
+    m_wroteSinceArrival = false;
     const QByteArray bytes = m_port.readAll();
     if (!bytes.isEmpty())
         emit received(bytes);

@@ -65,5 +65,6 @@ private:
     // it to listen.
     bool m_dtr = true;
     bool m_isPty = false;
+    bool m_wroteSinceArrival = false;
     QSerialPort::PinoutSignals m_pins;
 };

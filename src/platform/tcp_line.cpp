@@ -104,16 +104,21 @@ bool TcpLine::write(const QByteArray& bytes)
     if (m_socket.write(bytes) != bytes.size())
         return false;
     m_socket.flush();
+    m_wroteSinceArrival = true;
     return true;
 }
 
 void TcpLine::discardInput()
 {
-    m_socket.readAll();
+    // As on a serial line: once something was written since the last
+    // arrival, what waits is the answer to it and stays.
+    if (!m_wroteSinceArrival)
+        m_socket.readAll();
 }
 
 void TcpLine::onReadyRead()
 {
+    m_wroteSinceArrival = false;
     const QByteArray bytes = m_socket.readAll();
     if (!bytes.isEmpty())
         emit received(bytes);

@@ -53,4 +53,5 @@ private:
     Handshaking m_handshaking = Handshaking::None;
     bool m_dtr = true;
     bool m_closing = false;
+    bool m_wroteSinceArrival = false;
 };

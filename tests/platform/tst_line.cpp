@@ -188,6 +188,30 @@ private slots:
         QTRY_COMPARE(joined(p.received), QByteArray("fresh"));
     }
 
+    void serialDiscardKeepsTheAnswerToAWrite()
+    {
+        // A parser writes the next command and then the dispatcher discards
+        // input; a peer that answers at once must not lose its answer.
+        PtyLine p;
+        QVERIFY(p.open());
+        QVERIFY(p.pty.writeMaster("stale"));
+        QTRY_COMPARE(joined(p.received), QByteArray("stale"));
+        p.received.clear();
+        QVERIFY(p.line.write("e"));
+        QCOMPARE(p.pty.readMaster(2000), QByteArray("e"));
+        QVERIFY(p.pty.writeMaster("donedown"));
+        pollfd slave { p.pty.slaveFd(), POLLIN, 0 };
+        QCOMPARE(::poll(&slave, 1, 2000), 1);
+        p.line.discardInput();
+        QTRY_COMPARE(joined(p.received), QByteArray("donedown"));
+        // With nothing written since, a later discard drops what waits.
+        QVERIFY(p.pty.writeMaster("noise"));
+        QCOMPARE(::poll(&slave, 1, 2000), 1);
+        p.line.discardInput();
+        QVERIFY(p.pty.writeMaster("next"));
+        QTRY_COMPARE(joined(p.received), QByteArray("donedownnext"));
+    }
+
     void serialHangUpClosesWithLineLost()
     {
         PtyLine p;
