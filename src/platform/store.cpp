@@ -320,6 +320,18 @@ static void setError(QString* error, const QString& text)
         *error = text;
 }
 
+std::unique_ptr<Store> Store::connectTo(const QString& path)
+{
+    const QString connection = nextConnectionName();
+    {
+        QSqlDatabase db = QSqlDatabase::addDatabase(sqlite::Driver, connection);
+        db.setDatabaseName(path);
+        sqlite::setConnectOptions(db);
+        db.open();
+    }
+    return std::unique_ptr<Store>(new Store(path, connection));
+}
+
 std::unique_ptr<Store> Store::open(const QString& path, QString* error)
 {
     const QString name = QFileInfo(path).fileName();
@@ -331,15 +343,8 @@ std::unique_ptr<Store> Store::open(const QString& path, QString* error)
         setError(error, QStringLiteral("%1 is not a data base, or it is damaged.").arg(name));
         return nullptr;
     }
-    const QString connection = nextConnectionName();
-    {
-        QSqlDatabase db = QSqlDatabase::addDatabase(sqlite::Driver, connection);
-        db.setDatabaseName(path);
-        sqlite::setConnectOptions(db);
-        db.open();
-    }
-    std::unique_ptr<Store> store(new Store(path, connection));
-    QSqlDatabase db = QSqlDatabase::database(connection, false);
+    std::unique_ptr<Store> store = connectTo(path);
+    QSqlDatabase db = QSqlDatabase::database(store->connectionName(), false);
     if (!db.isOpen()) {
         setError(error, QStringLiteral("%1 cannot be opened: %2").arg(name, errorText(db.lastError())));
         return nullptr;
@@ -368,15 +373,8 @@ std::unique_ptr<Store> Store::create(const QString& path, int userVersion, QStri
         setError(error, QStringLiteral("%1 already exists.").arg(path));
         return nullptr;
     }
-    const QString connection = nextConnectionName();
-    {
-        QSqlDatabase db = QSqlDatabase::addDatabase(sqlite::Driver, connection);
-        db.setDatabaseName(path);
-        sqlite::setConnectOptions(db);
-        db.open();
-    }
-    std::unique_ptr<Store> store(new Store(path, connection));
-    QSqlDatabase db = QSqlDatabase::database(connection, false);
+    std::unique_ptr<Store> store = connectTo(path);
+    QSqlDatabase db = QSqlDatabase::database(store->connectionName(), false);
     QString why;
     bool ok = db.isOpen();
     if (!ok)

@@ -83,6 +83,9 @@ public:
 private:
     friend class Recordset;
     Store(QString path, QString connection);
+    // A new connection to the file, whether it opened or not: the caller
+    // checks and says why.
+    static std::unique_ptr<Store> connectTo(const QString& path);
     bool configure();
     void requeryAll();
     QString m_path;
