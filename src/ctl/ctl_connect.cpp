@@ -1,6 +1,7 @@
 #include "ctl/ctl_connect.h"
 
 #include "directory/data_folder.h"
+#include "shell/builtin_simulator_line.h"
 
 #include <QEventLoop>
 #include <QFileInfo>
@@ -27,6 +28,14 @@ Connection::~Connection()
 int Connection::open(const QString& command)
 {
     m_id = m_options.id;
+    // A new data folder is made as at the workstation's first start, so that
+    // every command finds the same demo instrument there.
+    QString folderError;
+    if (!DataFolder(m_options.dataDir).ensure(&folderError)) {
+        std::fprintf(stderr, "q19ctl: the data folder %s cannot be used: %s\n", qPrintable(m_options.dataDir),
+                     qPrintable(folderError));
+        return ctl::Failure;
+    }
     const QString directory = m_options.dataDir + QStringLiteral("/q-19.db");
     if (QFileInfo::exists(directory)) {
         if (std::unique_ptr<Store> dir = Store::open(directory)) {
@@ -59,7 +68,11 @@ int Connection::open(const QString& command)
             m_info = m_store->openRecordset(QStringLiteral("info"));
     }
 
-    m_engine = std::make_unique<ccForm1_engine>(clock, op, m_settings, views, globals);
+    // A data folder made by the workstation's demo names the built-in simulator as its port.
+    auto lineFactory = [this](const QString& port) {
+        return makeWorkstationLine(port, [this] { return m_engine && m_engine->Option2[0].value.toBool(); });
+    };
+    m_engine = std::make_unique<ccForm1_engine>(clock, op, m_settings, views, globals, lineFactory);
     ccForm1_engine& engine = *m_engine;
     engine.setInstrument(m_id, m_phone, m_info.get());
     engine.LoadPropertySettings();

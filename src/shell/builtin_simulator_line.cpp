@@ -154,3 +154,10 @@ void BuiltinSimulatorLine::setDtr(bool on)
     if (m_inner)
         m_inner->setDtr(on);
 }
+
+std::unique_ptr<Line> makeWorkstationLine(const QString& portName, std::function<bool()> modemWanted)
+{
+    if (portName == BuiltinSimulatorLine::PortName)
+        return std::make_unique<BuiltinSimulatorLine>(std::move(modemWanted));
+    return makeLine(portName);
+}

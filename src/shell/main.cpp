@@ -4,7 +4,6 @@
 #include "link/link_globals.h"
 #include "link/open_views.h"
 #include "platform/clock.h"
-#include "platform/line_factory.h"
 #include "platform/settings.h"
 #include "platform/widget_operator.h"
 #include "shell/app_version.h"
@@ -84,13 +83,8 @@ int main(int argc, char* argv[])
     op.setParentWidget(&mainWindow);
 
     ccForm1_engine* lineEngine = nullptr;
-    auto lineFactory = [&lineEngine](const QString& port) -> std::unique_ptr<Line> {
-        if (port == BuiltinSimulatorLine::PortName) {
-            return std::make_unique<BuiltinSimulatorLine>([&lineEngine] {
-                return lineEngine && lineEngine->Option2[0].value.toBool();
-            });
-        }
-        return makeLine(port);
+    auto lineFactory = [&lineEngine](const QString& port) {
+        return makeWorkstationLine(port, [&lineEngine] { return lineEngine && lineEngine->Option2[0].value.toBool(); });
     };
     ccForm1_engine line(clock, op, settings, views, globals, lineFactory);
     lineEngine = &line;
