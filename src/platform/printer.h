@@ -12,8 +12,13 @@
 
 class Printer {
 public:
+    // The reports were laid out in Arial. Liberation Sans has Arial's metrics
+    // and is installed with the program, so a report lays out the same on every
+    // machine; a family the machine lacks would be replaced by a wider face.
+    static inline const QString ReportFamily = QStringLiteral("Liberation Sans");
+
     struct Font {
-        QString family = QStringLiteral("Arial");
+        QString family = ReportFamily;
         double size = 10;
         bool bold = false;
         bool operator==(const Font&) const = default;

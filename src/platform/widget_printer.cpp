@@ -12,9 +12,15 @@ namespace {
 // A margin that every printer can print within.
 constexpr qreal kMarginMm = 10;
 // A Tab column is Arial's average character width (xAvgCharWidth 904 of
-// 2048 units), whatever font stands in for Arial here: the reports were laid
-// out in it, and the widest puts its last column at 164 of a portrait page.
+// 2048 units): the reports were laid out in it, and the widest puts its last
+// column at 164 of a portrait page.
 constexpr qreal kColumnEm = 904.0 / 2048.0;
+// The advance of a-z in Arial (Helvetica's widths), in ems. A face that is
+// wider than that, standing in for a family the machine lacks, widens the
+// columns by as much and a little more, so that a heading never runs into
+// the next column.
+constexpr qreal kArialLowercaseEm = 12.726;
+const QString kLowercase = QStringLiteral("abcdefghijklmnopqrstuvwxyz");
 
 void setMargins(QPagedPaintDevice& device)
 {
@@ -57,7 +63,9 @@ void WidgetPrinter::applyFont()
     const QFontMetricsF fm(m_qfont, &m_device);
     m_lineHeight = fm.lineSpacing();
     m_ascent = fm.ascent();
-    m_column = kColumnEm * m_font.size * m_device.logicalDpiX() / 72.0;
+    const qreal em = m_font.size * m_device.logicalDpiX() / 72.0;
+    const qreal widening = fm.horizontalAdvance(kLowercase) / (kArialLowercaseEm * em);
+    m_column = kColumnEm * em * (widening > 1.005 ? widening * 1.02 : 1.0);
 }
 
 void WidgetPrinter::setFont(const Font& font)

@@ -399,7 +399,7 @@ void StatusCycle::staleTick()
 
 void StatusCycle::printHead(Printer& printer, const QString& title) const
 {
-    printer.setFont({QStringLiteral("Arial"), ReportFontSize, false});
+    printer.setFont({Printer::ReportFamily, ReportFontSize, false});
     printer.line(title);
     printer.endLine();
     printer.line(QStringLiteral("Glacinor ID  ") + Text10[0].text);

@@ -50,7 +50,7 @@ void tst_printer::callsAreRecorded()
 {
     using K = RecordingPrinter::Kind;
     RecordingPrinter p;
-    const Printer::Font bold{QStringLiteral("Arial"), 7, true};
+    const Printer::Font bold{Printer::ReportFamily, 7, true};
     p.setFont(bold);
     p.line(QStringLiteral("Chan No."), {{13, QStringLiteral("Bank No.")}});
     p.endDoc();

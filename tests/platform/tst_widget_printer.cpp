@@ -45,7 +45,7 @@ void tst_widget_printer::longReportGoesOnToNewPagesLosingNoLine()
     constexpr int kLines = 300;
     int pages = 0;
     QVERIFY(printToPdf(pdf, [&](Printer& p) {
-        p.setFont({QStringLiteral("Arial"), 7, false});
+        p.setFont({Printer::ReportFamily, 7, false});
         for (int i = 0; i < kLines; ++i)
             p.line(QStringLiteral("line %1").arg(i), {{20, QStringLiteral("end %1").arg(i)}});
         p.newPage();
@@ -67,7 +67,7 @@ void tst_widget_printer::passedTabColumnGoesToTheNextLine()
 {
     const QString pdf = m_dir.filePath(QStringLiteral("tab.pdf"));
     QVERIFY(printToPdf(pdf, [](Printer& p) {
-        p.setFont({QStringLiteral("Arial"), 10, true});
+        p.setFont({Printer::ReportFamily, 10, true});
         p.line(QStringLiteral("a text that runs well past column ten"), {{10, QStringLiteral("next")}});
         p.line(QStringLiteral("short"), {{30, QStringLiteral("same")}});
         p.endDoc();

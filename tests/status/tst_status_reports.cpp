@@ -85,7 +85,7 @@ void tst_status_reports::temperatureReport()
     RecordingPrinter p;
     e.printgraph_Click(p);
     QVERIFY(p.ended());
-    QCOMPARE(p.font(), (Printer::Font{QStringLiteral("Arial"), 7, false}));
+    QCOMPARE(p.font(), (Printer::Font{Printer::ReportFamily, 7, false}));
     const QStringList& l = p.lines();
     QCOMPARE(l.size(), kHeadLines + 2 + frmstatus_engine::Rows);
     QCOMPARE(l[0], QStringLiteral("Velmark Instruments Glacinor Current Temperature Status"));
