@@ -82,6 +82,17 @@ bool channels_transfer_engine::send(const QByteArray& body)
     return m_link.Output(commands::framed(commands::Sender::Channels, body));
 }
 
+void channels_transfer_engine::loadValidation()
+{
+    Recordset& info = m_store.infoTable();
+    const QVariantList fallback = info.column(kInfoDefault);
+    const QVariantList minimum = info.column(kInfoMinimum);
+    const QVariantList maximum = info.column(kInfoMaximum);
+    m_validation.clear();
+    for (int row = 0; row < kInfoValidationRows && row < fallback.size(); ++row)
+        m_validation.append({fallback[row], minimum.value(row), maximum.value(row)});
+}
+
 void channels_transfer_engine::lineLost()
 {
     if (!m_running)
@@ -161,6 +172,7 @@ void channels_transfer_engine::uploadall_Click()
     m_transferTotal = catalogue::kChannels;
     upload_retries = 0;
     upload_all = true;
+    loadValidation();
     setForms(false);
     const bool sent = send("c");
     setButtons(false);
@@ -186,6 +198,7 @@ void channels_transfer_engine::uploadchan_Click()
     m_transferred = 0;
     m_transferTotal = 1;
     upload_all = false;
+    loadValidation();
     setForms(false);
     const int wire = wireChannelOfRow();
     const bool sent = send("a" + QByteArray::number(wire) + ',');
@@ -246,7 +259,8 @@ void channels_transfer_engine::sin_chan_up_load()
     return_string = channel_record::widenedRecord(return_string, channel, version);
 
     Recordset& sp = m_store.setpointsTable();
-    Recordset& info = m_store.infoTable();
+    if (m_validation.isEmpty())
+        loadValidation(); // a record nobody asked for
     saved_position = sp.AbsolutePosition();
     Store::Transaction tx(m_store.store());
     sp.setAbsolutePosition(channel);
@@ -266,10 +280,13 @@ void channels_transfer_engine::sin_chan_up_load()
                 invalid = 1;
             break;
         }
-        case ValueKind::Checked:
-            info.setAbsolutePosition(v.infoRow);
-            store_checked(sp, info, channel_record::uploadNumber(text), v.field, invalid);
+        case ValueKind::Checked: {
+            // As store_checked does it, against the row read at the start.
+            const Validation c = m_validation.value(v.infoRow);
+            sp.setValue(v.field, catalogue::checkedValue(channel_record::uploadNumber(text), c.fallback, c.minimum,
+                                                         c.maximum, &invalid));
             break;
+        }
         }
         // A time just repaired is not checked at once: the next value's
         // check catches it.
@@ -371,10 +388,9 @@ void channels_transfer_engine::endOfTransfer()
 {
     Recordset& sp = m_store.setpointsTable();
     const int back = saved_position;
-    for (int row = 0; row < catalogue::kChannels && row < sp.RecordCount(); ++row) {
-        sp.setAbsolutePosition(row);
-        Command1_struck[std::size_t(row)] = sp.value(catalogue::kConnectedField).toInt() == 0;
-    }
+    const QVariantList connected = sp.column(catalogue::kConnectedField);
+    for (int row = 0; row < catalogue::kChannels && row < connected.size(); ++row)
+        Command1_struck[std::size_t(row)] = connected[row].toInt() == 0;
     sp.setAbsolutePosition(back >= 0 ? back : 0);
     emit refillScreen();
     setButtons(true);
@@ -452,17 +468,27 @@ void channels_transfer_engine::sin_chan_down_load()
 {
     Recordset& sp = m_store.setpointsTable();
     sp.setAbsolutePosition(down_channel);
-    const QString description = sp.value(catalogue::kDescriptionField).toString();
-    const QString normal = channel_record::normalisedDescription(description, down_channel);
-    if (normal != description) {
+    const double version = m_link.globals().versionNumber();
+    // Only the fields that go down are read, in one query.
+    QList<int> fields = channel_record::downloadFields(down_channel, version);
+    if (!fields.contains(catalogue::kDescriptionField))
+        fields.append(catalogue::kDescriptionField);
+    const QVariantList read = sp.values(fields);
+    std::array<QVariant, catalogue::kSetpointFields> byField;
+    for (qsizetype i = 0; i < fields.size() && i < read.size(); ++i)
+        byField[std::size_t(fields[i])] = read[i];
+    QVariant& description = byField[catalogue::kDescriptionField];
+    const QString normal = channel_record::normalisedDescription(description.toString(), down_channel);
+    if (normal != description.toString()) {
         Store::Transaction tx(m_store.store());
         sp.Edit();
         sp.setValue(catalogue::kDescriptionField, normal);
         sp.Update();
         tx.commit();
+        description = normal;
     }
-    down_record = channel_record::downloadRecord(down_channel, m_link.globals().versionNumber(),
-                                                 [&sp](int field) { return sp.value(field); });
+    down_record = channel_record::downloadRecord(down_channel, version,
+                                                 [&byField](int field) { return byField[std::size_t(field)]; });
 }
 
 bool channels_transfer_engine::sendDownRecord(bool fresh)

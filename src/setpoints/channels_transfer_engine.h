@@ -113,6 +113,7 @@ private:
     void timeRepair(int field, int channel);
     bool sendDownRecord(bool fresh);
     void giveUp();
+    void loadValidation();
     void confirmedWrite();
     bool send(const QByteArray& body);
     int wireChannelOfRow();
@@ -125,6 +126,12 @@ private:
     AuditTrail* m_audit = nullptr;
     std::unique_ptr<ChannelSources> m_sources;
     int m_auditEntry = -1;
+    // `info` columns 1, 3 and 4 by row, read once a transfer: a record is
+    // checked without a query a value.
+    struct Validation {
+        QVariant fallback, minimum, maximum;
+    };
+    QList<Validation> m_validation;
     int m_transferred = 0;
     int m_transferTotal = 0;
     bool m_running = false;
