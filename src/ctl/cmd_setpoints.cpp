@@ -131,7 +131,14 @@ public:
                          });
         start();
         if (m_channels->transferRunning())
-            m_conn.waitFor([&] { return ended; }, kTransferCapMs);
+            m_conn.waitFor(
+                [&] {
+                    // A line that closes ends the transfer at once.
+                    if (!ended && m_channels->transferRunning() && !m_conn.engine().line().isOpen())
+                        m_channels->lineLost();
+                    return ended;
+                },
+                kTransferCapMs);
         QObject::disconnect(m_channels.get(), &channels_transfer_engine::transferEnded, nullptr, nullptr);
         QObject::disconnect(m_channels.get(), &channels_transfer_engine::channelDone, nullptr, nullptr);
         return ended && ok;
@@ -236,19 +243,37 @@ int differences(const CtlOptions& o, int channel)
     return ctl::Ok;
 }
 
+// Refuses a download of channels whose store rows never came from the
+// instrument (they hold the template's values), unless forced.
+bool mayDownload(const CtlOptions& o, int channel)
+{
+    const QString path = storePath(o, instrumentId(o, nullptr));
+    std::unique_ptr<InstrumentStore> store = path.isEmpty() ? nullptr : InstrumentStore::open(path);
+    if (!store)
+        return true; // opening it for the transfer says why
+    const QList<int> never = channels_transfer_engine::channelsNeverFilled(*store, channel);
+    if (never.isEmpty())
+        return true;
+    for (const QString& line : channels_transfer_engine::neverFilledText(never))
+        err(line);
+    err(QStringLiteral("Upload from the Glacinor first, or give --force to download anyway."));
+    return false;
+}
+
 int setpoints(const CtlOptions& given)
 {
-    // --yes may also follow the command's own arguments.
+    // --yes and --force may also follow the command's own arguments.
     CtlOptions o = given;
     if (o.args.removeAll(QStringLiteral("--yes")) > 0)
         o.yes = true;
+    const bool force = o.args.removeAll(QStringLiteral("--force")) > 0;
     const QString sub = o.args.value(0);
     const int channel = parseScope(o.args, 1);
     if ((sub != QLatin1String("upload") && sub != QLatin1String("download") && sub != QLatin1String("diff"))
         || (channel < 0 && sub != QLatin1String("diff"))
         || (sub == QLatin1String("diff") && o.args.size() > 1 && channel < 0)) {
         err(QStringLiteral("usage: setpoints upload (--all | --channel N) | download (--all | --channel N) "
-                           "| diff [--all | --channel N]"));
+                           "[--force] | diff [--all | --channel N]"));
         return ctl::Usage;
     }
     if (sub == QLatin1String("diff"))
@@ -257,6 +282,8 @@ int setpoints(const CtlOptions& given)
 
     Session s(o);
     if (sub == QLatin1String("download")) {
+        if (!force && !mayDownload(o, channel))
+            return ctl::Failure;
         const QString what = channel ? QStringLiteral("channel %1").arg(channel) : QStringLiteral("all channels");
         if (s.op().message(QStringLiteral("Download"),
                            {QStringLiteral("Are you sure !,"),
@@ -283,6 +310,15 @@ int setpoints(const CtlOptions& given)
                 }
             },
             QStringLiteral("downloaded"));
+    }
+    if (!ok) {
+        const channels_transfer_engine& c = s.channels();
+        err(QStringLiteral("%1 failed: %2 of %3 channels %4")
+                .arg(sub)
+                .arg(c.channelsTransferred())
+                .arg(c.channelsInTransfer())
+                .arg(sub == QLatin1String("upload") ? QStringLiteral("stored, the rest of the store is as it was")
+                                                    : QStringLiteral("taken by the Glacinor")));
     }
     return ok ? ctl::Ok : ctl::Failure;
 }
@@ -387,9 +423,9 @@ int audit(const CtlOptions& o)
 
 const ctl::Registration setpointsCommand(
     {QStringLiteral("setpoints"),
-     QStringLiteral("upload (--all | --channel N) | download (--all | --channel N) | diff [--channel N]"),
-     QStringLiteral("upload the set points into the store, download the store into the instrument, or list "
-                    "what a download would change"),
+     QStringLiteral("upload (--all | --channel N) | download (--all | --channel N) [--force] | diff [--channel N]"),
+     QStringLiteral("upload the set points into the store, download the store into the instrument (channels "
+                    "never uploaded or edited only with --force), or list what a download would change"),
      setpoints});
 const ctl::Registration setCommand({QStringLiteral("set"), QStringLiteral("FUNCTION CHANNEL SUBFUNCTION VALUE"),
                                     QStringLiteral("write one set point (screen units) to the store and the "

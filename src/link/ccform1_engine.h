@@ -44,6 +44,7 @@ public:
     // --- Link ---
     bool Output(const QByteArray& bytes) override;
     void discardInput() override;
+    void emptyReceiveBuffer() override { emptyBuffer(); }
     QString test3Text() const override { return test3; }
     LinkGlobals& globals() override { return m_globals; }
     void startWaitUd() override;

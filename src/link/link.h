@@ -17,6 +17,9 @@ public:
     virtual bool Output(const QByteArray& bytes) = 0;
     // InBufferCount = 0.
     virtual void discardInput() = 0;
+    // InBufferCount = 0 and test3 emptied: nothing half received stays in
+    // front of the next reply.
+    virtual void emptyReceiveBuffer() = 0;
     // test3.Text: the receive buffer after the line filter (CR LF line ends).
     virtual QString test3Text() const = 0;
     virtual LinkGlobals& globals() = 0;

@@ -634,6 +634,8 @@ struct Recordset::Statements {
     QHash<QString, QSqlQuery> updates;
     // One field of one row, by ordinal.
     QHash<int, QSqlQuery> cells;
+    // Some fields of one row, keyed by the fields read.
+    QHash<QString, QSqlQuery> partial;
     QSqlDatabase db;
 };
 
@@ -850,13 +852,87 @@ QVariantList Recordset::values() const
     return out;
 }
 
+QVariantList Recordset::values(const QList<int>& ordinals) const
+{
+    QVariantList out;
+    out.reserve(ordinals.size());
+    const bool fresh = m_currentLoaded || m_mode == Mode::AddNew || !m_sql || !hasCurrent();
+    for (int o : ordinals)
+        if (o < 0 || o >= fieldCount())
+            return fail(QStringLiteral("There is no field %1").arg(o)), QVariantList();
+    if (fresh) {
+        for (int o : ordinals)
+            out.append(value(o));
+        return out;
+    }
+    QString key;
+    for (int o : ordinals)
+        key += QString::number(o) + QLatin1Char(',');
+    auto it = m_sql->partial.find(key);
+    if (it == m_sql->partial.end()) {
+        // Records have few layouts; a runaway cache is cut back, not grown.
+        if (m_sql->partial.size() > 64)
+            m_sql->partial.clear();
+        QStringList cols;
+        for (int o : ordinals)
+            cols.append(quoted(m_fields.at(o)));
+        QSqlQuery q(m_sql->db);
+        q.setForwardOnly(true);
+        if (!q.prepare(QStringLiteral("SELECT %1 FROM %2 WHERE %3 = ?")
+                           .arg(cols.join(QLatin1String(", ")), quoted(m_table), sqlite::RowId)))
+            return fail(errorText(q.lastError())), QVariantList();
+        it = m_sql->partial.insert(key, q);
+    }
+    QSqlQuery& q = it.value();
+    q.bindValue(0, m_rowIds.at(m_pos));
+    if (!q.exec())
+        return fail(errorText(q.lastError())), QVariantList();
+    if (!q.next()) {
+        q.finish();
+        return fail(QStringLiteral("The record has been deleted")), QVariantList();
+    }
+    for (int i = 0; i < ordinals.size(); ++i) {
+        const int o = ordinals.at(i);
+        if (m_mode != Mode::None && m_dirty.at(o))
+            out.append(fromStored(m_types.at(o), m_buffer.at(o)));
+        else
+            out.append(q.isNull(i) ? QVariant() : fromStored(m_types.at(o), q.value(i)));
+    }
+    q.finish();
+    return out;
+}
+
+QVariantList Recordset::column(int ordinal)
+{
+    if (ordinal < 0 || ordinal >= fieldCount())
+        return fail(QStringLiteral("There is no field %1").arg(ordinal)), QVariantList();
+    if (!m_sql)
+        return fail(StoreClosed), QVariantList();
+    QSqlQuery q(m_sql->db);
+    q.setForwardOnly(true);
+    if (!q.exec(QStringLiteral("SELECT %1, %2 FROM %3").arg(sqlite::RowId, quoted(m_fields.at(ordinal)), quoted(m_table))))
+        return fail(errorText(q.lastError())), QVariantList();
+    QHash<qint64, QVariant> byRow;
+    byRow.reserve(m_rowIds.size());
+    while (q.next())
+        byRow.insert(q.value(0).toLongLong(), q.isNull(1) ? QVariant() : fromStored(m_types.at(ordinal), q.value(1)));
+    QVariantList out;
+    out.reserve(m_rowIds.size());
+    for (qint64 id : m_rowIds)
+        out.append(byRow.value(id));
+    return out;
+}
+
 bool Recordset::Edit()
 {
     if (!hasCurrent())
         return fail(NoCurrentRecord);
+    if (!m_sql)
+        return fail(StoreClosed);
     leaveEditing();
-    if (!loadCurrent())
-        return false;
+    // The record is read when a value of it is asked for: an edit that
+    // writes a record through never reads its few hundred fields. A record
+    // deleted meanwhile is refused by Update.
     m_mode = Mode::Edit;
     m_buffer = QVariantList(fieldCount());
     m_dirty = QList<bool>(fieldCount(), false);

@@ -138,6 +138,11 @@ public:
     QVariant value(int ordinal) const;
     QVariant value(const QString& name) const { return value(ordinalOf(name)); }
     QVariantList values() const;
+    // Some fields of the current record in one query, without reading the
+    // others of a wide row; values set since Edit win.
+    QVariantList values(const QList<int>& ordinals) const;
+    // One field of every record, in the set's order, in one query.
+    QVariantList column(int ordinal);
 
     bool Edit();
     bool AddNew();

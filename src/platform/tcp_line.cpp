@@ -111,8 +111,9 @@ bool TcpLine::write(const QByteArray& bytes)
 void TcpLine::discardInput()
 {
     // As on a serial line: once something was written since the last
-    // arrival, what waits is the answer to it and stays.
-    if (!m_wroteSinceArrival)
+    // arrival, what waits is the answer to it and stays. A closed socket has
+    // nothing to give (and Qt warns about the read).
+    if (!m_wroteSinceArrival && m_socket.isOpen())
         m_socket.readAll();
 }
 

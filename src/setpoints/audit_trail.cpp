@@ -70,25 +70,40 @@ bool AuditTrail::setOutcome(int entry, const QString& outcome)
     return m_rows->setCell(entry, Outcome, outcome) && tx.commit();
 }
 
+AuditEntry AuditTrail::current() const
+{
+    AuditEntry e;
+    e.time = m_rows->value(Time).toDateTime();
+    e.kind = m_rows->value(Kind).toString();
+    const QVariant f = m_rows->value(Function);
+    e.function = isNull(f) ? -1 : f.toInt();
+    e.channel = m_rows->value(Channel).toInt();
+    const QVariant s = m_rows->value(Subfunction);
+    e.subfunction = isNull(s) ? -1 : s.toInt();
+    e.oldValue = m_rows->value(OldValue).toString();
+    e.newValue = m_rows->value(NewValue).toString();
+    e.outcome = m_rows->value(Outcome).toString();
+    return e;
+}
+
 QList<AuditEntry> AuditTrail::entries()
 {
     QList<AuditEntry> out;
     const int saved = m_rows->AbsolutePosition();
-    for (bool more = m_rows->MoveFirst(); more && !m_rows->atEOF(); more = m_rows->MoveNext()) {
-        AuditEntry e;
-        e.time = m_rows->value(Time).toDateTime();
-        e.kind = m_rows->value(Kind).toString();
-        const QVariant f = m_rows->value(Function);
-        e.function = isNull(f) ? -1 : f.toInt();
-        e.channel = m_rows->value(Channel).toInt();
-        const QVariant s = m_rows->value(Subfunction);
-        e.subfunction = isNull(s) ? -1 : s.toInt();
-        e.oldValue = m_rows->value(OldValue).toString();
-        e.newValue = m_rows->value(NewValue).toString();
-        e.outcome = m_rows->value(Outcome).toString();
-        out.append(e);
-    }
+    for (bool more = m_rows->MoveFirst(); more && !m_rows->atEOF(); more = m_rows->MoveNext())
+        out.append(current());
     if (saved >= 0)
         m_rows->setAbsolutePosition(saved);
     return out;
+}
+
+AuditEntry AuditTrail::last()
+{
+    const int saved = m_rows->AbsolutePosition();
+    AuditEntry e;
+    if (m_rows->MoveLast())
+        e = current();
+    if (saved >= 0)
+        m_rows->setAbsolutePosition(saved);
+    return e;
 }

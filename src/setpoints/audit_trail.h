@@ -41,9 +41,12 @@ public:
     // "X" when the instrument confirmed, "V" when the write was abandoned.
     bool setOutcome(int entry, const QString& outcome);
     QList<AuditEntry> entries();
+    // The newest entry; its kind is empty when there is none.
+    AuditEntry last();
 
 private:
     AuditTrail(Store& store, Clock& clock, std::unique_ptr<Recordset> rows);
+    AuditEntry current() const;
     Store& m_store;
     Clock& m_clock;
     std::unique_ptr<Recordset> m_rows;

@@ -25,6 +25,7 @@ enum class Block {
 };
 
 constexpr int kCompressorTypeField = 165;
+constexpr int kPidFullOnField = 224;
 
 struct Run {
     int firstField;
@@ -181,6 +182,13 @@ QList<RecordValue> uploadLayout(int wireChannel, double version)
         }
     }
     return out;
+}
+
+UncheckedRange uncheckedRange(int field)
+{
+    if (field == kPidFullOnField)
+        return {-30, 30};
+    return {};
 }
 
 QString widenedRecord(const QString& received, int wireChannel, double version)

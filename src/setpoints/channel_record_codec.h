@@ -22,10 +22,16 @@ constexpr int kFirstValuePosition = 7;
 constexpr int kFillerPosition = 364;
 inline const QString kFiller = QStringLiteral("111111222222333333444444555555");
 constexpr double kPidFirmware = 14.0;
-// Fields 223..227: no `info` row; 0..100 is kept, anything else becomes 20.
-constexpr int kUncheckedMin = 0;
-constexpr int kUncheckedMax = 100;
+// Fields 223..227: no `info` row; a value within the field's fixed range is
+// kept, anything else becomes 20.
 constexpr int kUncheckedDefault = 20;
+struct UncheckedRange {
+    int min = 0;
+    int max = 100;
+};
+// Field 224 (function 83) is a signed offset of -3.0..3.0 oC, stored x10;
+// the others are 0..100.
+UncheckedRange uncheckedRange(int field);
 
 enum class ValueKind {
     Checked,     // tested against its `info` row by store_checked

@@ -6,6 +6,7 @@
 #include "setpoints/audit_trail.h"
 #include "setpoints/catalogue.h"
 #include "setpoints/channel_record_codec.h"
+#include "setpoints/channel_sources.h"
 #include "setpoints/instrument_schema.h"
 #include "setpoints/instrument_store.h"
 #include "setpoints/upload_progress_engine.h"
@@ -48,6 +49,11 @@ channels_transfer_engine::channels_transfer_engine(Link& link, Clock& clock, Ope
     connect(&Timer5, &Timer::timeout, this, &channels_transfer_engine::Timer5_Timer);
     connect(&Timer6, &Timer::timeout, this, &channels_transfer_engine::Timer6_Timer);
     connect(&writer, &WritePath::changed, this, &channels_transfer_engine::changed);
+    connect(&writer, &WritePath::confirmed, this, &channels_transfer_engine::confirmedWrite);
+    QString error;
+    m_sources = ChannelSources::open(m_store.store(), &error);
+    if (!m_sources)
+        qWarning("the channels' sources cannot be kept: %s", qPrintable(error));
     Recordset& sp = m_store.setpointsTable();
     if (sp.AbsolutePosition() < 0)
         sp.MoveFirst();
@@ -69,6 +75,70 @@ void channels_transfer_engine::setChannel(int channel)
 int channels_transfer_engine::channel()
 {
     return m_store.setpointsTable().AbsolutePosition() + 1;
+}
+
+bool channels_transfer_engine::send(const QByteArray& body)
+{
+    return m_link.Output(commands::framed(commands::Sender::Channels, body));
+}
+
+void channels_transfer_engine::loadValidation()
+{
+    Recordset& info = m_store.infoTable();
+    const QVariantList fallback = info.column(kInfoDefault);
+    const QVariantList minimum = info.column(kInfoMinimum);
+    const QVariantList maximum = info.column(kInfoMaximum);
+    m_validation.clear();
+    for (int row = 0; row < kInfoValidationRows && row < fallback.size(); ++row)
+        m_validation.append({fallback[row], minimum.value(row), maximum.value(row)});
+}
+
+void channels_transfer_engine::lineLost()
+{
+    if (!m_running)
+        return;
+    Timer6.stop();
+    down_running = false;
+    giveUp();
+}
+
+void channels_transfer_engine::confirmedWrite()
+{
+    // The write just confirmed is the newest entry of the trail; a global
+    // value lives in row 0.
+    if (!m_audit || !m_sources)
+        return;
+    const AuditEntry e = m_audit->last();
+    if (e.kind == QLatin1String("P") && e.outcome == QLatin1String("X"))
+        m_sources->mark(e.channel > 0 ? e.channel - 1 : 0, ChannelSources::Source::Edit);
+}
+
+QList<int> channels_transfer_engine::channelsNeverFilled(InstrumentStore& store, int channel)
+{
+    QList<int> wires;
+    for (int wire = 0; wire < catalogue::kChannels; ++wire)
+        if (channel == 0 || wire == channel - 1)
+            wires.append(wire);
+    QList<int> out;
+    // A store whose marks cannot be read is treated as never filled.
+    const std::unique_ptr<ChannelSources> sources = ChannelSources::open(store.store());
+    for (int wire : sources ? sources->fromTemplate(wires) : wires)
+        out.append(wire + 1);
+    return out;
+}
+
+QStringList channels_transfer_engine::neverFilledText(const QList<int>& channels)
+{
+    if (channels.isEmpty())
+        return {};
+    const QString which = channels.size() == 1
+                              ? QStringLiteral("Channel %1 has").arg(channels.first())
+                              : QStringLiteral("%1 of 216 channels (%2) have")
+                                    .arg(channels.size())
+                                    .arg(ChannelSources::channelRuns(channels));
+    return {QStringLiteral("%1 never been uploaded from the Glacinor or edited,").arg(which),
+            QStringLiteral("the computer only holds the default set points for %1.")
+                .arg(channels.size() == 1 ? QStringLiteral("it") : QStringLiteral("them"))};
 }
 
 int channels_transfer_engine::wireChannelOfRow()
@@ -98,10 +168,13 @@ void channels_transfer_engine::uploadall_Click()
         return;
     m_running = true;
     m_failed = false;
+    m_transferred = 0;
+    m_transferTotal = catalogue::kChannels;
     upload_retries = 0;
     upload_all = true;
+    loadValidation();
     setForms(false);
-    m_link.Output(commands::framed(commands::Sender::Channels, "c"));
+    const bool sent = send("c");
     setButtons(false);
     m_upload.Show(QStringLiteral("Upload"), uploadedLabel(0),
                   QStringLiteral("Up Loading all Channels from the Glacinor"), 0);
@@ -109,6 +182,8 @@ void channels_transfer_engine::uploadall_Click()
     Timer5.start(g.speed_factor * 6000);
     Timer6.start(g.speed_factor * 5000);
     emit changed();
+    if (!sent)
+        lineLost();
 }
 
 void channels_transfer_engine::uploadchan_Click()
@@ -120,14 +195,19 @@ void channels_transfer_engine::uploadchan_Click()
         return;
     m_running = true;
     m_failed = false;
+    m_transferred = 0;
+    m_transferTotal = 1;
     upload_all = false;
+    loadValidation();
     setForms(false);
     const int wire = wireChannelOfRow();
-    m_link.Output(commands::framed(commands::Sender::Channels, "a" + QByteArray::number(wire) + ','));
+    const bool sent = send("a" + QByteArray::number(wire) + ',');
     sent_to_glacinor = QString::number(wire) + QLatin1Char(',');
     setButtons(false);
     Timer5.start(g.speed_factor * (wire == 0 ? 5000 : 4000));
     emit changed();
+    if (!sent)
+        lineLost();
 }
 
 void channels_transfer_engine::timeRepair(int field, int channel)
@@ -179,12 +259,12 @@ void channels_transfer_engine::sin_chan_up_load()
     return_string = channel_record::widenedRecord(return_string, channel, version);
 
     Recordset& sp = m_store.setpointsTable();
-    Recordset& info = m_store.infoTable();
+    if (m_validation.isEmpty())
+        loadValidation(); // a record nobody asked for
     saved_position = sp.AbsolutePosition();
     Store::Transaction tx(m_store.store());
     sp.setAbsolutePosition(channel);
     sp.Edit();
-    bool justRepaired = false;
     for (const RecordValue& v : channel_record::uploadLayout(channel, version)) {
         const QString text = channel_record::valueText(return_string, v);
         switch (v.kind) {
@@ -193,33 +273,40 @@ void channels_transfer_engine::sin_chan_up_load()
             break;
         case ValueKind::Unchecked: {
             double n = 0;
-            const bool ok = catalogue::numericValue(text, &n) && n >= channel_record::kUncheckedMin
-                            && n <= channel_record::kUncheckedMax;
+            const channel_record::UncheckedRange range = channel_record::uncheckedRange(v.field);
+            const bool ok = catalogue::numericValue(text, &n) && n >= range.min && n <= range.max;
             sp.setValue(v.field, ok ? catalogue::storeNumber(n) : QVariant(channel_record::kUncheckedDefault));
             if (!ok)
                 invalid = 1;
             break;
         }
-        case ValueKind::Checked:
-            info.setAbsolutePosition(v.infoRow);
-            store_checked(sp, info, channel_record::uploadNumber(text), v.field, invalid);
+        case ValueKind::Checked: {
+            // As store_checked does it, against the row read at the start.
+            const Validation c = m_validation.value(v.infoRow);
+            sp.setValue(v.field, catalogue::checkedValue(channel_record::uploadNumber(text), c.fallback, c.minimum,
+                                                         c.maximum, &invalid));
             break;
         }
-        const bool checkNow = !justRepaired;
-        justRepaired = false;
+        }
+        // A time just repaired is not checked at once: the next value's
+        // check catches it.
+        bool justRepaired = false;
         if (catalogue::timeGroupOf(v.field)) {
             const QVariant before = sp.value(v.field);
             timeRepair(v.field, channel);
             justRepaired = sp.value(v.field) != before;
         }
-        if (invalid == 1 && checkNow && !justRepaired) {
+        if (invalid == 1 && !justRepaired) {
             sp.CancelUpdate();
             invalidValue(channel, v.kind == ValueKind::Unchecked ? -1 - v.field : v.infoRow);
             return;
         }
     }
     sp.Update();
+    if (m_sources)
+        m_sources->mark(channel, ChannelSources::Source::Upload);
     tx.commit();
+    ++m_transferred;
     emit channelDone(channel + 1);
 
     LinkGlobals& g = m_link.globals();
@@ -228,10 +315,12 @@ void channels_transfer_engine::sin_chan_up_load()
             Timer5.start(g.speed_factor * 4000);
             Timer6.start(g.speed_factor * 3000);
             upload_retries = 0;
-            m_link.Output(commands::framed(commands::Sender::Channels, "c"));
+            const bool sent = send("c");
             m_upload.Show(m_upload.Caption.text, uploadedLabel(channel + 1), m_upload.Label2.text, channel);
             sp.setAbsolutePosition(saved_position);
             emit changed();
+            if (!sent)
+                lineLost();
             return;
         }
         // The last record: nothing is to be asked for again.
@@ -299,10 +388,9 @@ void channels_transfer_engine::endOfTransfer()
 {
     Recordset& sp = m_store.setpointsTable();
     const int back = saved_position;
-    for (int row = 0; row < catalogue::kChannels && row < sp.RecordCount(); ++row) {
-        sp.setAbsolutePosition(row);
-        Command1_struck[std::size_t(row)] = sp.value(catalogue::kConnectedField).toInt() == 0;
-    }
+    const QVariantList connected = sp.column(catalogue::kConnectedField);
+    for (int row = 0; row < catalogue::kChannels && row < connected.size(); ++row)
+        Command1_struck[std::size_t(row)] = connected[row].toInt() == 0;
     sp.setAbsolutePosition(back >= 0 ? back : 0);
     emit refillScreen();
     setButtons(true);
@@ -326,10 +414,13 @@ void channels_transfer_engine::Timer6_Timer()
     if (upload_retries >= kUploadRetries)
         return; // Timer5 decides
     LinkGlobals& g = m_link.globals();
-    m_link.discardInput();
-    m_link.Output(commands::framed(commands::Sender::Channels, "c"));
+    // Half a record in the buffer would stand in front of the next one.
+    m_link.emptyReceiveBuffer();
+    const bool sent = send("c");
     Timer6.start(g.speed_factor * 3000);
     restart(Timer5, g.speed_factor * 5000);
+    if (!sent)
+        lineLost();
 }
 
 void channels_transfer_engine::giveUp()
@@ -342,7 +433,7 @@ void channels_transfer_engine::giveUp()
                  {QStringLiteral("The comunication with the Glacinor was not successful,"),
                   QStringLiteral("Re do the last command")},
                  Operator::Icon::Exclamation);
-    m_link.discardInput();
+    m_link.emptyReceiveBuffer();
     setButtons(true);
     setForms(true);
     m_upload.Unload();
@@ -362,7 +453,8 @@ void channels_transfer_engine::Timer5_Timer()
     ++down_timeouts;
     if (down_timeouts < kDownloadTries) {
         restart(Timer5, m_link.globals().speed_factor * 5000);
-        sendDownRecord(false);
+        if (!sendDownRecord(false))
+            lineLost();
         return;
     }
     down_running = false;
@@ -376,29 +468,40 @@ void channels_transfer_engine::sin_chan_down_load()
 {
     Recordset& sp = m_store.setpointsTable();
     sp.setAbsolutePosition(down_channel);
-    const QString description = sp.value(catalogue::kDescriptionField).toString();
-    const QString normal = channel_record::normalisedDescription(description, down_channel);
-    if (normal != description) {
+    const double version = m_link.globals().versionNumber();
+    // Only the fields that go down are read, in one query.
+    QList<int> fields = channel_record::downloadFields(down_channel, version);
+    if (!fields.contains(catalogue::kDescriptionField))
+        fields.append(catalogue::kDescriptionField);
+    const QVariantList read = sp.values(fields);
+    std::array<QVariant, catalogue::kSetpointFields> byField;
+    for (qsizetype i = 0; i < fields.size() && i < read.size(); ++i)
+        byField[std::size_t(fields[i])] = read[i];
+    QVariant& description = byField[catalogue::kDescriptionField];
+    const QString normal = channel_record::normalisedDescription(description.toString(), down_channel);
+    if (normal != description.toString()) {
         Store::Transaction tx(m_store.store());
         sp.Edit();
         sp.setValue(catalogue::kDescriptionField, normal);
         sp.Update();
         tx.commit();
+        description = normal;
     }
-    down_record = channel_record::downloadRecord(down_channel, m_link.globals().versionNumber(),
-                                                 [&sp](int field) { return sp.value(field); });
+    down_record = channel_record::downloadRecord(down_channel, version,
+                                                 [&byField](int field) { return byField[std::size_t(field)]; });
 }
 
-void channels_transfer_engine::sendDownRecord(bool fresh)
+bool channels_transfer_engine::sendDownRecord(bool fresh)
 {
     sin_chan_down_load();
-    m_link.Output(commands::framed(commands::Sender::Channels, "d" + down_record.toLatin1()));
+    const bool sent = send("d" + down_record.toLatin1());
     sent_to_glacinor = down_record + QStringLiteral("downcheck");
     if (fresh && m_audit) {
         if (m_auditEntry >= 0)
             m_audit->setOutcome(m_auditEntry, QStringLiteral("V"));
         m_auditEntry = m_audit->begin(QStringLiteral("d"), -1, down_channel + 1, -1, QString(), down_record);
     }
+    return sent;
 }
 
 void channels_transfer_engine::downloadall_Click()
@@ -411,6 +514,8 @@ void channels_transfer_engine::downloadall_Click()
     m_running = true;
     m_failed = false;
     saved_position = m_store.setpointsTable().AbsolutePosition();
+    m_transferred = 0;
+    m_transferTotal = catalogue::kChannels;
     down_all = true;
     down_channel = 0;
     down_timeouts = 0;
@@ -419,10 +524,12 @@ void channels_transfer_engine::downloadall_Click()
     setButtons(false);
     m_upload.Show(QStringLiteral("Download"), downloadedLabel(1),
                   QStringLiteral("Down Loading all Channels to the Glacinor"), 0);
-    sendDownRecord(true);
+    const bool sent = sendDownRecord(true);
     Timer5.start(g.speed_factor * 5000);
     Timer6.stop();
     emit changed();
+    if (!sent)
+        lineLost();
 }
 
 void channels_transfer_engine::downloadchan_Click()
@@ -434,13 +541,17 @@ void channels_transfer_engine::downloadchan_Click()
     m_running = true;
     m_failed = false;
     saved_position = m_store.setpointsTable().AbsolutePosition();
+    m_transferred = 0;
+    m_transferTotal = 1;
     down_all = false;
     down_channel = wireChannelOfRow();
     setForms(false);
     setButtons(false);
-    sendDownRecord(true);
+    const bool sent = sendDownRecord(true);
     Timer5.start(g.speed_factor * (down_channel == 0 ? 5000 : 4000));
     emit changed();
+    if (!sent)
+        lineLost();
 }
 
 void channels_transfer_engine::down_check()
@@ -473,6 +584,7 @@ void channels_transfer_engine::down_check()
 void channels_transfer_engine::done_down()
 {
     Recordset& sp = m_store.setpointsTable();
+    ++m_transferred;
     if (down_all) {
         emit channelDone(down_channel + 1);
         ++down_channel;
@@ -489,10 +601,12 @@ void channels_transfer_engine::done_down()
             emit transferEnded(!m_failed);
             return;
         }
-        sendDownRecord(true);
+        const bool sent = sendDownRecord(true);
         m_upload.setProgress(down_channel, downloadedLabel(down_channel + 1));
         restart(Timer5, m_link.globals().speed_factor * 4000);
         emit changed();
+        if (!sent)
+            lineLost();
         return;
     }
     emit channelDone(down_channel + 1);

@@ -13,10 +13,12 @@
 
 #include <QObject>
 #include <array>
+#include <memory>
 
 class Link;
 class InstrumentStore;
 class AuditTrail;
+class ChannelSources;
 class upload_progress_engine;
 
 class channels_transfer_engine : public QObject, public ChannelsView {
@@ -72,6 +74,23 @@ public:
 
     // A transfer started and not ended yet.
     bool transferRunning() const { return m_running; }
+    // Channels of the transfer now running (or the last one) that went
+    // through: stored by an upload, taken by the instrument in a download;
+    // and how many it was to move (216 or 1).
+    int channelsTransferred() const { return m_transferred; }
+    int channelsInTransfer() const { return m_transferTotal; }
+
+    // The channels (1-based) that a download of `channel` (0: all) from this
+    // store would send although their rows never came from the instrument,
+    // by upload or by a confirmed edit: they hold the template's values.
+    // Asked before the download's question (q19ctl, "Download all"); empty
+    // when the download may go. Needs no line.
+    static QList<int> channelsNeverFilled(InstrumentStore& store, int channel);
+    // The program's words for such channels, for the refusal or the question.
+    static QStringList neverFilledText(const QList<int>& channels);
+    // The line went while a transfer ran: it ends now with the give-up,
+    // rather than asking a closed port again until Timer5 runs out.
+    void lineLost();
 
 signals:
     void changed();
@@ -92,8 +111,11 @@ private:
     void invalidValue(int channel, int infoRow);
     void channelInvalid();
     void timeRepair(int field, int channel);
-    void sendDownRecord(bool fresh);
+    bool sendDownRecord(bool fresh);
     void giveUp();
+    void loadValidation();
+    void confirmedWrite();
+    bool send(const QByteArray& body);
     int wireChannelOfRow();
 
     Link& m_link;
@@ -102,7 +124,16 @@ private:
     InstrumentStore& m_store;
     upload_progress_engine& m_upload;
     AuditTrail* m_audit = nullptr;
+    std::unique_ptr<ChannelSources> m_sources;
     int m_auditEntry = -1;
+    // `info` columns 1, 3 and 4 by row, read once a transfer: a record is
+    // checked without a query a value.
+    struct Validation {
+        QVariant fallback, minimum, maximum;
+    };
+    QList<Validation> m_validation;
+    int m_transferred = 0;
+    int m_transferTotal = 0;
     bool m_running = false;
     bool m_failed = false;
 };

@@ -14,6 +14,7 @@
 #include <QJsonDocument>
 #include <QJsonObject>
 #include <QProcess>
+#include <QRegularExpression>
 #include <QSignalSpy>
 #include <QTemporaryDir>
 #include <QtTest>
@@ -114,6 +115,8 @@ private slots:
 #ifdef Q19CTL_PATH
     void ctlUploadSetDiffDownloadAudit_data();
     void ctlUploadSetDiffDownloadAudit();
+    void ctlDownloadsOnlyWhatCameFromTheInstrument();
+    void ctlUploadCutOffSaysHowFarItGot();
 #endif
 };
 
@@ -243,6 +246,59 @@ void TestE2ESetpoints::ctlUploadSetDiffDownloadAudit()
     QCOMPARE(rows[1].toObject().value("outcome").toString(), QStringLiteral("V"));
     QCOMPARE(rows[217].toObject().value("channel").toInt(), 216);
     QCOMPARE(rows[217].toObject().value("outcome").toString(), QStringLiteral("X"));
+}
+void TestE2ESetpoints::ctlDownloadsOnlyWhatCameFromTheInstrument()
+{
+    Sim sim;
+    QVERIFY(sim.start(QStringLiteral("14")));
+    QTemporaryDir data; // a new data folder: its store holds the template's values
+
+    CtlRun r = ctl(data.path(), sim.path, {"setpoints", "download", "--channel", "1", "--yes"});
+    QCOMPARE(r.exitCode, 1);
+    QVERIFY2(r.err.contains(QStringLiteral("Channel 1 has never been uploaded from the Glacinor or edited,")),
+             qPrintable(r.err));
+    QVERIFY2(!r.err.contains(QStringLiteral("Connecting")), qPrintable(r.err)); // refused before the line opens
+    r = ctl(data.path(), sim.path, {"setpoints", "upload", "--channel", "1"});
+    QVERIFY2(r.exitCode == 0, qPrintable(r.err));
+    r = ctl(data.path(), sim.path, {"setpoints", "download", "--channel", "1", "--yes"});
+    QVERIFY2(r.exitCode == 0, qPrintable(r.err));
+    r = ctl(data.path(), sim.path, {"setpoints", "download", "--all", "--yes"});
+    QCOMPARE(r.exitCode, 1);
+    QVERIFY2(r.err.contains(QStringLiteral("215 of 216 channels (2-216) have never been uploaded")), qPrintable(r.err));
+    r = ctl(data.path(), sim.path, {"setpoints", "download", "--channel", "2", "--force", "--yes"});
+    QVERIFY2(r.exitCode == 0, qPrintable(r.err));
+}
+
+void TestE2ESetpoints::ctlUploadCutOffSaysHowFarItGot()
+{
+    Sim sim;
+    QVERIFY(sim.start(QStringLiteral("14")));
+    sim.control("delay = 20"); // slow enough to be cut off in the middle
+    QTemporaryDir data;
+    QProcess p;
+    p.setReadChannel(QProcess::StandardError);
+    p.start(QStringLiteral(Q19CTL_PATH), QStringList{"--data-dir", data.path(), "--id", "1", "--port", sim.path,
+                                                     "setpoints", "upload", "--all"});
+    QString err;
+    while (!err.contains(QStringLiteral("Channel 20 of 216 uploaded")) && p.waitForReadyRead(20000))
+        err += QString::fromLocal8Bit(p.readAllStandardError());
+    sim.process.kill();
+    sim.process.waitForFinished(2000);
+    QVERIFY(p.waitForFinished(60000));
+    err += QString::fromLocal8Bit(p.readAllStandardError());
+    QCOMPARE(p.exitCode(), 1);
+    const QRegularExpressionMatch m =
+        QRegularExpression(QStringLiteral("upload failed: (\\d+) of 216 channels stored")).match(err);
+    QVERIFY2(m.hasMatch(), qPrintable(err.right(400)));
+    const int stored = m.captured(1).toInt();
+    QVERIFY2(stored >= 20 && stored < 216, qPrintable(err.right(400)));
+    QVERIFY2(!err.contains(QStringLiteral("QIODevice")), qPrintable(err.right(400)));
+    // The channels stored are the ones marked as coming from the instrument; the others are untouched.
+    std::unique_ptr<InstrumentStore> store = InstrumentStore::open(data.filePath(QStringLiteral("t-1.db")));
+    QVERIFY(store);
+    QCOMPARE(channels_transfer_engine::channelsNeverFilled(*store, 0).size(), 216 - stored);
+    QVERIFY(channels_transfer_engine::channelsNeverFilled(*store, stored).isEmpty());
+    QCOMPARE(channels_transfer_engine::channelsNeverFilled(*store, stored + 1), QList<int>{stored + 1});
 }
 #endif
 

@@ -53,6 +53,8 @@ private slots:
     void valueRoundTrip();
     void orderedKeepsInsertionOrderOnTies();
     void cellPutsPositionBack();
+    void partialReadsSeeThePendingEdit_data();
+    void partialReadsSeeThePendingEdit();
     void openRefuses_data();
     void openRefuses();
     void createStampsTheFile();
@@ -308,6 +310,53 @@ void TestStore::cellPutsPositionBack()
     QCOMPARE(rs->value(0).toInt(), 11);
     QVERIFY(rs->setAbsolutePosition(3));
     QCOMPARE(rs->value(0).toInt(), 33);
+}
+
+namespace {
+QList<int> ints(const QVariantList& values)
+{
+    QList<int> out;
+    for (const QVariant& v : values)
+        out << v.toInt();
+    return out;
+}
+} // namespace
+
+void TestStore::partialReadsSeeThePendingEdit_data()
+{
+    QTest::addColumn<bool>("ordered"); // by "Temp", which runs against the insertion order
+    QTest::addColumn<bool>("editing");
+    QTest::newRow("as inserted") << false << false;
+    QTest::newRow("as inserted, in Edit") << false << true;
+    QTest::newRow("ordered, in Edit") << true << true;
+}
+
+void TestStore::partialReadsSeeThePendingEdit()
+{
+    QFETCH(bool, ordered);
+    QFETCH(bool, editing);
+    auto store = makeLog(4); // "Ch 1" (ordinal 0) runs 0, 10, 20, 30
+    QVERIFY(store);
+    {
+        auto w = store->openRecordset(Log);
+        for (int row = 0; row < 4; ++row)
+            QVERIFY(w->setCell(row, 4, 3 - row));
+    }
+    auto rs = store->openRecordset(Log, ordered ? QStringLiteral("Temp") : QString());
+    QVERIFY(rs);
+    QCOMPARE(ints(rs->column(0)), ordered ? (QList<int>{30, 20, 10, 0}) : (QList<int>{0, 10, 20, 30}));
+    QVERIFY(rs->setAbsolutePosition(1));
+    if (editing) {
+        QVERIFY(rs->Edit());
+        QVERIFY(rs->setValue(0, 99));
+    }
+    const int ch1 = ordered ? 20 : 10;
+    QCOMPARE(ints(rs->values({4, 0})), (QList<int>{ordered ? 1 : 2, editing ? 99 : ch1}));
+    if (editing) {
+        QVERIFY(rs->Update());
+        QCOMPARE(ints(rs->values({0})), QList<int>{99});
+        QCOMPARE(ints(rs->column(0)).value(1), 99);
+    }
 }
 
 void TestStore::openRefuses_data()

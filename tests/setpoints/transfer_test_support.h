@@ -20,13 +20,21 @@ public:
     QList<QByteArray> out;
     QString buffer;
     int discards = 0;
+    bool lineOpen = true;
 
     bool Output(const QByteArray& bytes) override
     {
+        if (!lineOpen)
+            return false;
         out.append(bytes);
         return true;
     }
     void discardInput() override { ++discards; }
+    void emptyReceiveBuffer() override
+    {
+        ++discards;
+        buffer.clear();
+    }
     QString test3Text() const override { return buffer; }
     LinkGlobals& globals() override { return g; }
     void startWaitUd() override {}

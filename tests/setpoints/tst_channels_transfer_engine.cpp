@@ -11,6 +11,8 @@
 #include <QSignalSpy>
 
 using channel_record::RecordValue;
+// Received text by store field.
+using Values = QMap<int, QString>;
 
 class TestChannelsTransferEngine : public QObject {
     Q_OBJECT
@@ -25,6 +27,13 @@ private slots:
     void invalidChannelNumber();
     void messagesHoldTheUploadOfAll();
     void uploadAllRetriesThenGivesUp();
+    void retryEmptiesHalfARecord();
+    void checkRightAfterARepairedTime_data();
+    void checkRightAfterARepairedTime();
+    void pidValuesKeepTheirOwnRange_data();
+    void pidValuesKeepTheirOwnRange();
+    void lostLineEndsTheTransferAtOnce_data();
+    void lostLineEndsTheTransferAtOnce();
     void uploadAllEndsAfterChannel216();
     void downloadAllWritesEveryChannelAndNormalisesDescriptions();
     void downloadWrongEchoIsSentAgainThenCountsAsTimeout();
@@ -74,8 +83,8 @@ QString TestChannelsTransferEngine::validValue(int field)
     if (field == catalogue::kDescriptionField)
         return QStringLiteral("Dock 9");
     const int row = catalogue::replyRowOf(field);
-    if (row < 0)
-        return QStringLiteral("55");
+    if (row < 0) // fields 223..227: their fixed ranges, 224's below zero
+        return QString::number(channel_record::uncheckedRange(field).min + 5);
     if (m_minimum.isEmpty())
         for (const InfoValidationRow& r : infoValidationRows())
             m_minimum.append(channel_record::storeText(r.minimum));
@@ -268,8 +277,10 @@ void TestChannelsTransferEngine::uploadAllRetriesThenGivesUp()
     QCOMPARE(m_link->count(QStringLiteral("c")), 6);
     QCOMPARE(m_link->discards, 5);
     QVERIFY(m_op->messages().isEmpty());
+    m_link->buffer = QStringLiteral("     7 1 0 "); // a record cut off by the silence
     m_clock->advance(1);
     QCOMPARE(m_op->last().title, QStringLiteral("Comunications Failed"));
+    QCOMPARE(m_link->buffer, QString());
     QCOMPARE(m_op->last().lines, (QStringList{"The comunication with the Glacinor was not successful,",
                                               "Re do the last command"}));
     QCOMPARE(ended.count(), 1);
@@ -277,6 +288,131 @@ void TestChannelsTransferEngine::uploadAllRetriesThenGivesUp()
     m_clock->advance(100000);
     QCOMPARE(m_link->count(QStringLiteral("c")), 6);
     QCOMPARE(m_op->messages().size(), 1);
+}
+
+void TestChannelsTransferEngine::retryEmptiesHalfARecord()
+{
+    m_engine->uploadall_Click();
+    const QString record = uploadRecordText(0, 14, [&](int f) { return validValue(f); });
+    m_link->buffer = record.left(record.size() / 2);
+    m_clock->advance(10000); // Timer6 asks again
+    QCOMPARE(m_link->count(QStringLiteral("c")), 2);
+    // The answer to the second "c" arrives whole behind whatever stayed.
+    m_link->buffer += record;
+    m_engine->sin_chan_up_load();
+    QVERIFY2(m_op->messages().isEmpty(), qPrintable(m_op->last().toText()));
+    for (const RecordValue& v : channel_record::uploadLayout(0, 14))
+        QCOMPARE(channel_record::storeText(m_inst->store->setpoint(0, v.field)), validValue(v.field));
+    QCOMPARE(m_link->count(QStringLiteral("c")), 3);
+}
+
+void TestChannelsTransferEngine::checkRightAfterARepairedTime_data()
+{
+    QTest::addColumn<Values>("received");
+    QTest::addColumn<int>("reported"); // the field named in "The set point was"
+    // Channel 5: set point time 4 is repaired, Sunday's mask behind it is 0.
+    QTest::newRow("daily mask behind set point time 4")
+        << Values{{6, "600"}, {7, "700"}, {8, "800"}, {9, "500"}, {54, "99"}} << 54;
+    QTest::newRow("type of control behind defrost time 8")
+        << Values{{35, "100"}, {36, "200"}, {37, "300"}, {38, "400"}, {39, "500"}, {40, "600"},
+                              {41, "700"}, {42, "450"}, {51, "9"}}
+        << 51;
+    // An invalid time takes its default and is then repaired: the next value's check reports it.
+    QTest::newRow("invalid time repaired, caught by the next")
+        << Values{{6, "1439"}, {7, "9999"}, {8, "1439"}, {9, "1439"}} << 8;
+}
+
+void TestChannelsTransferEngine::checkRightAfterARepairedTime()
+{
+    QFETCH(Values, received);
+    QFETCH(int, reported);
+    QSignalSpy ended(m_engine.get(), &channels_transfer_engine::transferEnded);
+    m_engine->setChannel(5);
+    m_engine->uploadchan_Click();
+    m_link->buffer = uploadRecordText(4, 14, [&](int f) { return received.value(f, validValue(f)); });
+    m_engine->sin_chan_up_load();
+    QCOMPARE(m_op->titles(), (QStringList{"Wrong Time Value", "Update Not Completed"}));
+    const QString name = m_inst->store->info(catalogue::replyRowOf(reported), kInfoName).toString();
+    QCOMPARE(m_op->last().lines.value(2), QStringLiteral("The set point was %1,").arg(name));
+    QCOMPARE(ended.first().first().toBool(), false);
+    for (int field : received.keys())
+        QCOMPARE(m_inst->store->setpoint(4, field), templateSetpoint(4, field));
+}
+
+void TestChannelsTransferEngine::pidValuesKeepTheirOwnRange_data()
+{
+    QTest::addColumn<int>("field");
+    QTest::addColumn<QString>("received");
+    QTest::addColumn<bool>("valid");
+    QTest::newRow("224 lowest") << 224 << "-30" << true;
+    QTest::newRow("224 highest") << 224 << "30" << true;
+    QTest::newRow("224 below") << 224 << "-31" << false;
+    QTest::newRow("224 above") << 224 << "31" << false;
+    QTest::newRow("223 negative") << 223 << "-5" << false;
+    QTest::newRow("223 highest") << 223 << "100" << true;
+    QTest::newRow("225 negative") << 225 << "-1" << false;
+    QTest::newRow("227 above") << 227 << "101" << false;
+}
+
+void TestChannelsTransferEngine::pidValuesKeepTheirOwnRange()
+{
+    QFETCH(int, field);
+    QFETCH(QString, received);
+    QFETCH(bool, valid);
+    m_engine->setChannel(3);
+    m_engine->uploadchan_Click();
+    m_link->buffer = uploadRecordText(2, 14, [&](int f) { return f == field ? received : validValue(f); });
+    m_engine->sin_chan_up_load();
+    if (valid) {
+        QVERIFY2(m_op->messages().isEmpty(), qPrintable(m_op->last().toText()));
+        QCOMPARE(channel_record::storeText(m_inst->store->setpoint(2, field)), received);
+    } else {
+        QCOMPARE(m_op->titles(), QStringList{"Update Not Completed"});
+        QCOMPARE(m_op->last().lines.value(3),
+                 QStringLiteral("The Default value of 20 was placed in this setpoint on the computer"));
+        QCOMPARE(m_inst->store->setpoint(2, field), templateSetpoint(2, field));
+    }
+}
+
+void TestChannelsTransferEngine::lostLineEndsTheTransferAtOnce_data()
+{
+    QTest::addColumn<bool>("upload");
+    QTest::newRow("upload of all") << true;
+    QTest::newRow("download of all") << false;
+}
+
+void TestChannelsTransferEngine::lostLineEndsTheTransferAtOnce()
+{
+    QFETCH(bool, upload);
+    QVERIFY(m_inst->store->setSetpoint(3, 2, 77)); // the store's own value for channel 4
+    QSignalSpy ended(m_engine.get(), &channels_transfer_engine::transferEnded);
+    if (upload) {
+        m_engine->uploadall_Click();
+        for (int wire = 0; wire < 3; ++wire) {
+            m_link->lineOpen = wire < 2; // channel 3 arrives; asking for channel 4 fails
+            m_link->buffer = uploadRecordText(wire, 14, [&](int f) { return validValue(f); });
+            m_engine->sin_chan_up_load();
+        }
+    } else {
+        m_engine->downloadall_Click();
+        for (int i = 0; i < 2; ++i) {
+            m_link->buffer = m_engine->sent_to_glacinor;
+            m_engine->down_check();
+            m_engine->done_down();
+        }
+        m_link->buffer = m_engine->sent_to_glacinor;
+        m_engine->down_check();
+        m_link->lineOpen = false;
+        m_engine->done_down();
+    }
+    QCOMPARE(ended.count(), 1);
+    QCOMPARE(ended.first().first().toBool(), false);
+    QCOMPARE(m_op->titles(), QStringList{"Comunications Failed"});
+    QCOMPARE(m_engine->channelsTransferred(), 3);
+    QCOMPARE(m_engine->channelsInTransfer(), 216);
+    QVERIFY(!m_clock->isArmed(&m_engine->Timer5) && !m_clock->isArmed(&m_engine->Timer6));
+    QVERIFY(m_engine->uploadall.enabled && m_engine->forms_enabled);
+    QCOMPARE(m_inst->store->setpoint(3, 2).toInt(), 77);
 }
 
 void TestChannelsTransferEngine::uploadAllEndsAfterChannel216()
@@ -372,8 +508,10 @@ void TestChannelsTransferEngine::downloadGivesUpAfterSixTimeouts()
     m_clock->advance(3 * 10000 - 1);   // 4th, 5th, almost the 6th
     QCOMPARE(m_engine->down_timeouts, 5);
     QVERIFY(m_op->messages().isEmpty());
+    m_link->buffer = QStringLiteral("     7 1 0 "); // a record cut off by the silence
     m_clock->advance(1);
     QCOMPARE(m_op->last().title, QStringLiteral("Comunications Failed"));
+    QCOMPARE(m_link->buffer, QString());
     QCOMPARE(ended.count(), 1);
     QVERIFY(!m_engine->down_running && m_engine->downloadall.enabled);
 }

@@ -34,6 +34,7 @@ public:
     int hangUps = 0;
     bool Output(const QByteArray&) override { return true; }
     void discardInput() override {}
+    void emptyReceiveBuffer() override {}
     QString test3Text() const override { return {}; }
     LinkGlobals& globals() override { return g; }
     void startWaitUd() override {}

@@ -23,6 +23,7 @@ public:
         return true;
     }
     void discardInput() override {}
+    void emptyReceiveBuffer() override { test3.clear(); }
     QString test3Text() const override { return test3; }
     LinkGlobals& globals() override { return g; }
     void startWaitUd() override
