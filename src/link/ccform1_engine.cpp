@@ -324,10 +324,10 @@ void ccForm1_engine::LoadPropertySettings()
     cboParityItems = QStringList{"Even", "Mark", "None", "Odd", "Space"};
     cboStopBitsItems = QStringList{"1", "1.5", "2"};
 
+    // Each row that is empty or unreadable gets the form's own default,
+    // written back: a new instrument does not inherit the port of the last one.
     // Row 2: the port settings text.
-    QString text = infoCell(RowSettings).toString().trimmed();
-    if (text.isEmpty())
-        text = m_settings.value(QStringLiteral("Settings")).toString().trimmed();
+    const QString text = infoCell(RowSettings).toString().trimmed();
     std::optional<LineSettings> ls = LineSettings::parse(text);
     if (!ls) {
         ls = LineSettings::parse(kDefaultSettings);
@@ -349,9 +349,7 @@ void ccForm1_engine::LoadPropertySettings()
     bool ok = false;
     int flow = infoCell(RowFlow).toInt(&ok);
     if (!ok || flow < 0 || flow > 3) {
-        flow = m_settings.value(QStringLiteral("Handshaking"), 0).toInt(&ok);
-        if (!ok || flow < 0 || flow > 3)
-            flow = 0;
+        flow = 0;
         setInfoCell(RowFlow, flow);
     }
     for (int i = 0; i < 4; ++i)
@@ -359,8 +357,6 @@ void ccForm1_engine::LoadPropertySettings()
 
     // Row 3: the port. A bare number is the port number of older files.
     QString port = infoCell(RowPort).toString().trimmed();
-    if (port.isEmpty())
-        port = m_settings.value(QStringLiteral("CommPort")).toString().trimmed();
     bool numeric = false;
     const int number = port.toInt(&numeric);
     if (numeric && number > 0) {
@@ -371,6 +367,7 @@ void ccForm1_engine::LoadPropertySettings()
 #endif
     }
     if (port.isEmpty()) {
+        // Port 1: the first this machine has.
         port = cboPortItems.isEmpty() ? QStringLiteral("/dev/ttyS0") : cboPortItems.first().name;
         setInfoCell(RowPort, port);
     }
@@ -618,6 +615,10 @@ void ccForm1_engine::MSComm1_OnComm(int commEvent, const QByteArray& input)
         modem.text = modem_text;
         return;
     }
+    if (commEvent == Line::LineLost) {
+        lineLost();
+        return;
+    }
     if (commEvent == Line::Receive) {
         show_received(test3, text);
         Timer1.stop();
@@ -664,6 +665,26 @@ void ccForm1_engine::commsError()
     if (m_globals.link_up) {
         m_globals.link_up = false;
         closePort();
+        sbrStatus[3].visible = false;
+    }
+    Timer3.setEnabled(true);
+}
+
+void ccForm1_engine::lineLost()
+{
+    // The device or the connection is gone and the line closed already. It
+    // ends as a hang-up ends, and unlike a port error it is not kept in
+    // error_message, where it would close every later connect of the run.
+    const QString text = QStringLiteral("Unknown error or event");
+    sbrStatus[1].text = QStringLiteral("Status: ") + text;
+    m_op.beep();
+    say(QStringLiteral("Click Cancel to quit, OK to ignore."),
+        {text, QStringLiteral("Check communication setup")}, Operator::Icon::None,
+        Operator::Buttons::OkCancel);
+    if (Text3[3].text == kPortOpen || Text3[2].text == kPortOpen) {
+        hangUp();
+    } else {
+        m_globals.link_up = false;
         sbrStatus[3].visible = false;
     }
     Timer3.setEnabled(true);

@@ -164,6 +164,7 @@ private:
     QVariant infoCell(int row) const;
     void setInfoCell(int row, const QVariant& value);
     void commsError();
+    void lineLost();
     void modemConnect();
     void identityReply();
     void instrumentReset();

@@ -89,18 +89,4 @@ QLatin1String tokenText(Token token)
     return QLatin1String();
 }
 
-const std::array<Token, TokenCount>& tokenOrder()
-{
-    static const std::array<Token, TokenCount> order = {
-        Token::NoDialtone, Token::Busy,      Token::NoCarrier, Token::Connect,
-        Token::Glacinor,   Token::Sret,      Token::Schanupload, Token::Downcheck,
-        Token::Donedown,   Token::Reset,     Token::Dlres,     Token::Histy,
-        Token::Plres,      Token::Power,     Token::Status,    Token::Presss,
-        Token::Torvan,     Token::Realarms,  Token::Noalarms,  Token::Almlog,
-        Token::AlmNew,     Token::Nocomp,    Token::Tempfront, Token::Dxstart,
-        Token::Evapfrst,
-    };
-    return order;
-}
-
 } // namespace commands

@@ -2,7 +2,6 @@
 
 #include <QByteArray>
 #include <QString>
-#include <array>
 
 // The wire language: every text the program writes to the instrument or its
 // modem, and the tokens that end the replies. Senders compose their commands
@@ -56,15 +55,12 @@ QByteArray modemEscape();          // "+++", no line end
 QByteArray modemAskModulation();   // "AT+MS?" CR LF
 QByteArray modemCommand(const QString& text); // "AT" + text, CR LF
 
-// Tokens in the order the dispatcher looks for them.
+// Tokens in the order the dispatcher (reply_do) looks for them.
 enum class Token {
     NoDialtone, Busy, NoCarrier, Connect, Glacinor, Sret, Schanupload, Downcheck,
     Donedown, Reset, Dlres, Histy, Plres, Power, Status, Presss, Torvan, Realarms,
     Noalarms, Almlog, AlmNew, Nocomp, Tempfront, Dxstart, Evapfrst,
 };
-constexpr int TokenCount = 25;
 QLatin1String tokenText(Token token);
-// All tokens, in dispatch order.
-const std::array<Token, TokenCount>& tokenOrder();
 
 } // namespace commands

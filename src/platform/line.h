@@ -48,9 +48,9 @@ public:
         TransmitFull = 1010,
         DcbError = 1011,
         // Not a code of the communications control: the device went away
-        // under an open line (USB unplugged, pty master closed). The line is
-        // closed already when it is reported; the receive handler takes its
-        // "Unknown error or event" path, which ends the link.
+        // under an open line (USB unplugged, pty master closed, the TCP peer
+        // gone). The line is closed already when it is reported; the receive
+        // handler ends the link as a hang-up does and keeps no error behind.
         LineLost = 9999,
     };
     Q_ENUM(EventCode)

@@ -236,6 +236,21 @@ void SerialLine::setDtr(bool on)
 
 void SerialLine::onReadyRead()
 {
+    // Handed on from the event loop rather than from inside the port's
+    // signal: the port does not signal again while its signal runs, so bytes
+    // arriving under a message box of the receiver would wait unseen and be
+    // discarded behind the box.
+    if (m_deliveryQueued)
+        return;
+    m_deliveryQueued = true;
+    QMetaObject::invokeMethod(this, &SerialLine::deliverArrived, Qt::QueuedConnection);
+}
+
+void SerialLine::deliverArrived()
+{
+    m_deliveryQueued = false;
+    if (!isOpen())
+        return;
     m_wroteSinceArrival = false;
     const QByteArray bytes = m_port.readAll();
     if (!bytes.isEmpty())
@@ -256,7 +271,9 @@ void SerialLine::onError(QSerialPort::SerialPortError error)
         if (!isOpen())
             return;
         // Whatever came before the loss is still the instrument's.
-        onReadyRead();
+        deliverArrived();
+        if (!isOpen())
+            return;
         close();
         emit lineEvent(LineLost);
         break;

@@ -13,7 +13,9 @@
 // or break conditions, so 1004, 1009 and 1001 do not occur here; the receive
 // handler ignores those three anyway.
 // A device that goes away under the open line (USB unplugged, pty master
-// closed) closes the line and is reported as LineLost. Operations the device
+// closed) closes the line and is reported as LineLost.
+// Arrivals are delivered from the event loop, so a receiver that stands in
+// a message box still gets the bytes that come meanwhile. Operations the device
 // does not support (DTR on a pty, 1.5 stop bits) are not events, and on a
 // pty, which has no wire, refused settings are not errors either.
 //
@@ -51,6 +53,7 @@ public:
 
 private:
     void onReadyRead();
+    void deliverArrived();
     void onError(QSerialPort::SerialPortError error);
     void pollPins();
     bool applySettings(QString* error);
@@ -66,5 +69,6 @@ private:
     bool m_dtr = true;
     bool m_isPty = false;
     bool m_wroteSinceArrival = false;
+    bool m_deliveryQueued = false;
     QSerialPort::PinoutSignals m_pins;
 };

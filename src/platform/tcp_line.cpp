@@ -87,6 +87,7 @@ bool TcpLine::open(QString* error)
 
 void TcpLine::close()
 {
+    ++m_closes;
     m_closing = true;
     m_socket.abort();
     m_closing = false;
@@ -119,6 +120,17 @@ void TcpLine::discardInput()
 
 void TcpLine::onReadyRead()
 {
+    // From the event loop, as on a serial line: the socket does not signal
+    // again while its signal runs.
+    if (m_deliveryQueued)
+        return;
+    m_deliveryQueued = true;
+    QMetaObject::invokeMethod(this, &TcpLine::deliverArrived, Qt::QueuedConnection);
+}
+
+void TcpLine::deliverArrived()
+{
+    m_deliveryQueued = false;
     m_wroteSinceArrival = false;
     const QByteArray bytes = m_socket.readAll();
     if (!bytes.isEmpty())
@@ -129,8 +141,12 @@ void TcpLine::onDisconnected()
 {
     if (m_closing)
         return;
-    // The last reply before the hang-up still belongs to the instrument.
-    onReadyRead();
+    // The last reply before the hang-up still belongs to the instrument; it
+    // may itself end the link, and then nothing more is to be reported.
+    const int closes = m_closes;
+    deliverArrived();
+    if (m_closes != closes)
+        return;
     close();
-    emit lineEvent(CdChanged);
+    emit lineEvent(LineLost);
 }

@@ -7,8 +7,8 @@
 // The line over TCP: a serial device server or the simulator, named
 // "host:port" ("[::1]:4001" for IPv6). Settings, handshaking and DTR are
 // kept for the form but do not reach the wire; the server owns the real
-// port. The far end closing the connection is the carrier going away: the
-// line closes and reports event 5.
+// port. The far end closing the connection is the line going away: the
+// line closes and reports LineLost.
 class TcpLine : public Line {
     Q_OBJECT
 public:
@@ -45,6 +45,7 @@ public:
 
 private:
     void onReadyRead();
+    void deliverArrived();
     void onDisconnected();
 
     QTcpSocket m_socket;
@@ -54,4 +55,6 @@ private:
     bool m_dtr = true;
     bool m_closing = false;
     bool m_wroteSinceArrival = false;
+    bool m_deliveryQueued = false;
+    int m_closes = 0;
 };

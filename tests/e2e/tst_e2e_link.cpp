@@ -1,4 +1,5 @@
 #include "link/ccform1_engine.h"
+#include "platform/pty.h"
 
 #include <QProcess>
 #include <QSignalSpy>
@@ -54,6 +55,55 @@ struct Rig {
     }
 };
 
+QByteArray identity12()
+{
+    return "9.6    000120000305/01/2026 08:00:00   Glacinor";
+}
+
+// The far end of a direct line without the simulator: a pseudo-terminal or
+// a TCP peer that a test can make go away.
+struct FarEnd {
+    bool tcp = false;
+    QTcpServer server;
+    QTcpSocket* socket = nullptr;
+    std::unique_ptr<PtyPair> pty;
+
+    // The port to connect to; a pty that went away is replaced by a new one.
+    QString port()
+    {
+        if (tcp) {
+            if (!server.isListening())
+                server.listen(QHostAddress::LocalHost);
+            return QStringLiteral("127.0.0.1:%1").arg(server.serverPort());
+        }
+        pty = std::make_unique<PtyPair>();
+        // Only the line holds the slave, so closing the master is a hang-up.
+        pty->releaseSlave();
+        return pty->slavePath();
+    }
+    // Takes the connect request and answers with the identity of instrument 12.
+    bool answerIdentity()
+    {
+        if (!tcp)
+            return !pty->readMaster(5000).isEmpty() && pty->writeMaster(identity12());
+        if (!QTest::qWaitFor([&] { return server.hasPendingConnections(); }, 5000))
+            return false;
+        socket = server.nextPendingConnection();
+        if (!QTest::qWaitFor([&] { return socket->bytesAvailable() > 0; }, 5000))
+            return false;
+        socket->readAll();
+        socket->write(identity12());
+        return socket->flush();
+    }
+    void goAway()
+    {
+        if (tcp)
+            socket->disconnectFromHost();
+        else
+            pty->closeMaster();
+    }
+};
+
 } // namespace
 
 class TestE2ELink : public QObject {
@@ -65,6 +115,9 @@ private slots:
     void resetDuringALink();
     void modemBusyThenConnect();
     void ctlIdentifyOverTcp();
+    void arrivalUnderAMessageIsHandled();
+    void lostLineThenConnectAgain_data();
+    void lostLineThenConnectAgain();
 };
 
 void TestE2ELink::directConnectAndDisconnect()
@@ -186,6 +239,64 @@ void TestE2ELink::ctlIdentifyOverTcp()
     sim.kill();
     sim.waitForFinished(2000);
 #endif
+}
+
+void TestE2ELink::arrivalUnderAMessageIsHandled()
+{
+    PtyPair pty;
+    QVERIFY(pty.isValid());
+    Rig rig(pty.slavePath(), QStringLiteral("12"), false);
+    rig.op.setWhileShowing([&](const Operator::Message& m) {
+        if (m.title != QLatin1String("Data Log Reset"))
+            return;
+        // The call drops while the operator reads the message.
+        pty.writeMaster("\r\nNO CARRIER\r\n");
+        QTest::qWaitFor([&] { return rig.op.messages().size() > 1; }, 5000);
+    });
+    rig.engine.dial_num_Click();
+    QCOMPARE(pty.readMaster(5000), QByteArray("ATX4DT5551234\r\n"));
+    QVERIFY(pty.writeMaster("dlres"));
+    QTRY_COMPARE(rig.op.titles(), (QStringList{"Data Log Reset", "Busy"}));
+    QCOMPARE(rig.op.last().lines.value(0), QStringLiteral("No carrier signal."));
+    QCOMPARE(rig.engine.Text3[3].text, QStringLiteral("Port Closed"));
+    QVERIFY(!rig.globals.link_up);
+    QVERIFY(!rig.engine.line().isOpen());
+    QVERIFY(rig.engine.dial_num.enabled);
+}
+
+void TestE2ELink::lostLineThenConnectAgain_data()
+{
+    QTest::addColumn<bool>("tcp");
+    QTest::newRow("pty master closed") << false;
+    QTest::newRow("tcp peer closes") << true;
+}
+
+void TestE2ELink::lostLineThenConnectAgain()
+{
+    QFETCH(bool, tcp);
+    FarEnd far;
+    far.tcp = tcp;
+    Rig rig(far.port(), QStringLiteral("12"), true);
+    QSignalSpy accepted(&rig.engine, &ccForm1_engine::identityAccepted);
+    rig.engine.Command3_Click();
+    QVERIFY(far.answerIdentity());
+    QVERIFY(accepted.wait(5000));
+
+    far.goAway();
+    QTRY_COMPARE(rig.engine.Text3[2].text, QStringLiteral("Port Closed"));
+    QVERIFY(!rig.globals.link_up);
+    QVERIFY(rig.engine.Command3.enabled);
+    QCOMPARE(rig.op.titles(), QStringList{"Click Cancel to quit, OK to ignore."});
+
+    rig.engine.setCommPort(far.port());
+    rig.engine.Command3_Click();
+    QVERIFY(far.answerIdentity());
+    QTRY_COMPARE(accepted.size(), 2);
+    // A kept error would have closed the line behind the identity's dispatch.
+    QVERIFY(rig.engine.line().isOpen());
+    QVERIFY(rig.globals.link_up);
+    QCOMPARE(rig.engine.Text3[2].text, QStringLiteral("Port Open"));
+    QCOMPARE(rig.op.messages().size(), 1);
 }
 
 QTEST_GUILESS_MAIN(TestE2ELink)

@@ -10,43 +10,95 @@
 
 namespace {
 
-// Every role a view can play, recording the calls the dispatcher makes.
-struct Views : ChannelsView, HistoryView, PowerView, TemperatureStatusView, PressureStatusView,
-               PressureGraphicView, AlarmView, FrontView, BrumaletView, ShellView {
-    QStringList calls;
+// A view double that plays any role and logs "<form>.<procedure>". Each
+// view gets its own, so a reply given to the wrong view shows in the log.
+struct Double : ChannelsView, HistoryView, PowerView, TemperatureStatusView, PressureStatusView,
+                PressureGraphicView, AlarmView, FrontView, BrumaletView, ShellView {
+    QStringList* log = nullptr;
+    QString form;
     bool cycleRunning = false;
     OpenViews* table = nullptr;
-    QString who; // which status view a status_do call is for
-    void ret_handel() override { calls << "ret_handel"; }
-    void sin_chan_up_load() override { calls << "sin_chan_up_load"; }
-    void down_check() override { calls << "down_check"; }
-    void done_down() override { calls << "done_down"; }
-    void stopTimer5() override { calls << "channels.Timer5"; }
-    void stopTimer3() override { calls << "Timer3"; }
-    void history_do() override { calls << "history_do"; }
-    void power_do() override { calls << "power_do"; }
+    void rec(const QString& what) { *log << form + QLatin1Char('.') + what; }
+    void ret_handel() override { rec("ret_handel"); }
+    void sin_chan_up_load() override { rec("sin_chan_up_load"); }
+    void down_check() override { rec("down_check"); }
+    void done_down() override { rec("done_down"); }
+    void stopTimer5() override { rec("Timer5"); }
+    void stopTimer3() override { rec("Timer3"); }
+    void history_do() override { rec("history_do"); }
+    void power_do() override { rec("power_do"); }
     bool stopstatusEnabled() const override { return cycleRunning; }
-    void stopstatus_Click() override { calls << "stopstatus_Click"; }
-    void status_do() override { calls << "status_do"; }
-    void statusp_do() override { calls << "statusp_do"; }
-    void statuspa_do() override { calls << "statuspa_do"; }
-    void statuspg_do() override { calls << "statuspg_do"; }
-    void alarm_do(const QString& d) override { calls << "alarm_do:" + d; }
-    void uploadnew_Click() override { calls << "uploadnew_Click"; }
-    void stopTimer2() override { calls << "alarm.Timer2"; }
-    void showMaximised() override { calls << "showMaximised"; }
-    void Front_do(const QString&) override { calls << "Front_do"; }
-    void start_do(const QString&) override { calls << "start_do"; }
-    void status_do(const QString&) override { calls << "brumalet.status_do"; }
+    void stopstatus_Click() override { rec("stopstatus_Click"); }
+    void status_do() override { rec("status_do"); }
+    void statusp_do() override { rec("statusp_do"); }
+    void statuspa_do() override { rec("statuspa_do"); }
+    void statuspg_do() override { rec("statuspg_do"); }
+    void alarm_do(const QString& d) override { rec("alarm_do:" + d); }
+    void uploadnew_Click() override { rec("uploadnew_Click"); }
+    void stopTimer2() override { rec("Timer2"); }
+    void showMaximised() override { rec("showMaximised"); }
+    void Front_do(const QString&) override { rec("Front_do"); }
+    void start_do(const QString&) override { rec("start_do"); }
+    void status_do(const QString&) override { rec("status_do"); }
     void mnualarmon_Click() override
     {
-        calls << "mnualarmon_Click";
+        rec("mnualarmon_Click");
         table->alarm_open = true;
     }
-    void mnualloff_Click() override { calls << "mnualloff_Click"; }
-    void setToolbarEnabled(bool) override { calls << "Toolbar1"; }
-    void unloadUploadProgress() override { calls << "unload upload"; }
+    void mnualloff_Click() override { rec("mnualloff_Click"); }
+    void setToolbarEnabled(bool) override { rec("Toolbar1"); }
+    void unloadUploadProgress() override { rec("unload upload"); }
 };
+
+struct Views {
+    QStringList calls;
+    Double channels, loadshed, history, power, status, statusg, multiprobes, statusp, statuspg,
+        alarm, front, brumalet, shell;
+
+    void plugInto(OpenViews& t)
+    {
+        const std::pair<Double*, const char*> forms[] = {
+            {&channels, "channels"},       {&loadshed, "frmloadshed"}, {&history, "frmhistory"},
+            {&power, "frmpower"},          {&status, "frmstatus"},     {&statusg, "frmstatusg"},
+            {&multiprobes, "frmmultiprobes"}, {&statusp, "frmstatusp"}, {&statuspg, "frmstatuspg"},
+            {&alarm, "frmalarm"},          {&front, "frmfront"},       {&brumalet, "frmbrumalet"},
+            {&shell, "MDIForm1"}};
+        for (const auto& [d, form] : forms) {
+            d->log = &calls;
+            d->form = QString::fromLatin1(form);
+            d->table = &t;
+        }
+        t.channels = &channels;
+        t.loadshed = static_cast<ChannelsView*>(&loadshed);
+        t.history = &history;
+        t.power = &power;
+        t.status = &status;
+        t.statusg = &statusg;
+        t.multiprobes = &multiprobes;
+        t.statusp = &statusp;
+        t.statuspg = &statuspg;
+        t.alarm = &alarm;
+        t.front = &front;
+        t.brumalet = &brumalet;
+        t.shell = &shell;
+    }
+};
+
+// An info table of an instrument's store with field 41 holding the given rows.
+std::unique_ptr<Recordset> infoTable(Store& store, const QStringList& field41)
+{
+    QList<Store::Column> columns;
+    for (int c = 0; c < 42; ++c)
+        columns.append({QStringLiteral("f%1").arg(c), Store::ColumnType::Text});
+    if (!store.createTable("info", columns))
+        return nullptr;
+    std::unique_ptr<Recordset> info = store.openRecordset("info");
+    for (const QString& v : field41)
+        if (!info->AddNew() || !info->setValue(41, v.isEmpty() ? QVariant() : QVariant(v))
+            || !info->Update())
+            return nullptr;
+    return info;
+}
 
 // Flags of the open views, for data rows.
 enum Open {
@@ -67,18 +119,7 @@ struct Rig {
 
     explicit Rig(bool direct = true)
     {
-        views.table = &table;
-        table.history = &views;
-        table.power = &views;
-        table.alarm = &views;
-        table.channels = &views;
-        table.loadshed = static_cast<ChannelsView*>(&views);
-        table.status = table.statusg = table.multiprobes = &views;
-        table.statusp = &views;
-        table.statuspg = &views;
-        table.front = &views;
-        table.brumalet = &views;
-        table.shell = &views;
+        views.plugInto(table);
         engine = std::make_unique<ccForm1_engine>(
             clock, op, settings, table, globals, [this](const QString& name) {
                 auto l = std::make_unique<FakeLine>();
@@ -153,6 +194,18 @@ private slots:
     void openFailureNamesTheReason();
     void portChangeMakesNewLine();
     void settingsLiveInTheInstrumentsInfoRows();
+    void newInstrumentGetsTheDefaults_data();
+    void newInstrumentGetsTheDefaults();
+    void modemResultHangsUp_data();
+    void modemResultHangsUp();
+    void silenceAfterDial_data();
+    void silenceAfterDial();
+    void lineEvents_data();
+    void lineEvents();
+    void badIdentityHangsUpTheCall_data();
+    void badIdentityHangsUpTheCall();
+    void lostLineEndsTheLinkOnly_data();
+    void lostLineEndsTheLinkOnly();
 };
 
 void TestCcForm1Engine::dispatch_data()
@@ -161,45 +214,87 @@ void TestCcForm1Engine::dispatch_data()
     QTest::addColumn<int>("open");
     QTest::addColumn<QString>("version");
     QTest::addColumn<QStringList>("calls");
+    QTest::addColumn<QStringList>("said"); // "title: first line" of each message
     QTest::addColumn<bool>("cleared");
+    const QStringList none;
 
+    // Routing by the open views.
     QTest::newRow("sret, no view: no hit, text stays") << QByteArray("1,2,sret") << 0 << "9.6"
-                                                        << QStringList{} << false;
+                                                        << none << none << false;
     QTest::newRow("sret to load shed") << QByteArray("1,2,sret") << int(LoadShed) << "9.6"
-                                       << QStringList{"ret_handel"} << true;
-    QTest::newRow("sret to channels first") << QByteArray("1,2,sret") << int(Channels | LoadShed)
-                                            << "9.6" << QStringList{"ret_handel"} << true;
+                                       << QStringList{"frmloadshed.ret_handel"} << none << true;
+    QTest::newRow("sret to channels first")
+        << QByteArray("1,2,sret") << int(Channels | LoadShed) << "9.6"
+        << QStringList{"channels.ret_handel"} << none << true;
+    QTest::newRow("status to frmstatus first")
+        << QByteArray("status") << int(Status | StatusG | MultiProbes) << "9.6"
+        << QStringList{"frmstatus.status_do"} << none << true;
     QTest::newRow("status: statusg before multiprobes")
         << QByteArray("  1  2status") << int(StatusG | MultiProbes) << "9.6"
-        << QStringList{"status_do"} << true;
-    QTest::newRow("status: no view, dropped") << QByteArray("status") << 0 << "9.6" << QStringList{}
+        << QStringList{"frmstatusg.status_do"} << none << true;
+    QTest::newRow("status to multiprobes") << QByteArray("status") << int(MultiProbes) << "9.6"
+                                           << QStringList{"frmmultiprobes.status_do"} << none << true;
+    QTest::newRow("status: no view, dropped") << QByteArray("status") << 0 << "9.6" << none << none
                                               << true;
-    QTest::newRow("histy with view closed is dropped") << QByteArray("x histy") << 0 << "9.6"
-                                                       << QStringList{} << true;
-    QTest::newRow("histy before status in a payload")
-        << QByteArray("status histy") << int(History | Status) << "9.6"
-        << QStringList{"history_do"} << true;
-    QTest::newRow("tempfront with front closed stays") << QByteArray("tempfront") << 0 << "9.6"
-                                                       << QStringList{} << false;
-    QTest::newRow("dxstart with brumalet closed stays") << QByteArray("dxstart") << 0 << "9.6"
-                                                        << QStringList{} << false;
-    QTest::newRow("evapfrst to brumalet") << QByteArray("evapfrst") << int(Brumalet) << "9.6"
-                                          << QStringList{"brumalet.status_do"} << true;
-    QTest::newRow("torvan below version 8 dropped") << QByteArray("torvan") << int(StatusP) << "7.9"
-                                                    << QStringList{} << true;
-    QTest::newRow("torvan at 8") << QByteArray("torvan") << int(StatusP) << " 8"
-                                 << QStringList{"statuspa_do"} << true;
+    QTest::newRow("presss to statusp first") << QByteArray("presss") << int(StatusP | StatusPG)
+                                             << "9.6" << QStringList{"frmstatusp.statusp_do"}
+                                             << none << true;
     QTest::newRow("presss to statuspg") << QByteArray("presss") << int(StatusPG) << "9.6"
-                                        << QStringList{"statuspg_do"} << true;
-    QTest::newRow("almlog copies the buffer") << QByteArray("a\rb almlog") << int(Alarm) << "9.6"
-                                              << QStringList{"alarm_do:a\r\nb almlog"} << true;
-    QTest::newRow("dlres stops the data log timer") << QByteArray("dlres") << 0 << "9.6"
-                                                    << QStringList{"Timer3"} << true;
-    QTest::newRow("schanupload before status") << QByteArray("status schanupload")
-                                               << int(Channels | Status) << "9.6"
-                                               << QStringList{"sin_chan_up_load"} << true;
-    QTest::newRow("no token: text waits") << QByteArray("Glacino") << int(Status) << "9.6"
-                                          << QStringList{} << false;
+                                        << QStringList{"frmstatuspg.statuspg_do"} << none << true;
+    QTest::newRow("histy with view closed is dropped") << QByteArray("x histy") << 0 << "9.6"
+                                                       << none << none << true;
+    QTest::newRow("tempfront with front closed stays") << QByteArray("tempfront") << 0 << "9.6"
+                                                       << none << none << false;
+    QTest::newRow("dxstart with brumalet closed stays") << QByteArray("dxstart") << 0 << "9.6"
+                                                        << none << none << false;
+    QTest::newRow("evapfrst to brumalet") << QByteArray("evapfrst") << int(Brumalet) << "9.6"
+                                          << QStringList{"frmbrumalet.status_do"} << none << true;
+    QTest::newRow("torvan below version 8 dropped") << QByteArray("torvan") << int(StatusP) << "7.9"
+                                                    << none << none << true;
+    QTest::newRow("torvan at 8") << QByteArray("torvan") << int(StatusP) << " 8"
+                                 << QStringList{"frmstatusp.statuspa_do"} << none << true;
+    QTest::newRow("no token: text waits") << QByteArray("Glacino") << int(Status) << "9.6" << none
+                                          << none << false;
+
+    // The order of the chain: each token beats the next one, wherever it stands.
+    const int all = Channels | History | Power | Status | StatusP | Alarm | Front | Brumalet;
+    const auto order = [&](const char* name, const QByteArray& reply, const QStringList& calls,
+                           const QStringList& said) {
+        QTest::newRow(name) << reply << all << "9.6" << calls << said << true;
+    };
+    order("NO DIALTONE before BUSY", "BUSY NO DIALTONE", none,
+          {"No Dial Tone: There was no dial tone detected."});
+    order("BUSY before NO CARRIER", "NO CARRIER BUSY", none, {"Busy: The number dialed is busy."});
+    order("Glacinor before sret", "1,sret Glacinor", none,
+          {"Invalid Version Number: The Glacinor Version Number is invalid,"});
+    order("sret before schanupload", "schanupload sret", {"channels.ret_handel"}, none);
+    order("schanupload before downcheck", "downcheck schanupload", {"channels.sin_chan_up_load"},
+          none);
+    order("downcheck before donedown", "donedown downcheck", {"channels.down_check"}, none);
+    order("donedown before AT&FE0", "AT&FE0 donedown", {"channels.done_down"}, none);
+    order("AT&FE0 before dlres", "dlres AT&FE0",
+          {"MDIForm1.Toolbar1", "channels.Timer5", "MDIForm1.unload upload"},
+          {"No Response: The Glacinor did not respond or was reset."});
+    order("dlres before histy", "histy dlres", {"frmhistory.Timer3"},
+          {"Data Log Reset: The Data Log has been reset"});
+    order("histy before plres", "plres histy", {"frmhistory.history_do"}, none);
+    order("plres before power", "power plres", {"frmpower.Timer3"},
+          {"Data Log Reset: The Power Used Data Log has been reset"});
+    order("power before status", "status power", {"frmpower.power_do"}, none);
+    order("status before presss", "presss status", {"frmstatus.status_do"}, none);
+    order("presss before torvan", "torvan presss", {"frmstatusp.statusp_do"}, none);
+    order("torvan before realarms", "realarms torvan", {"frmstatusp.statuspa_do"}, none);
+    order("realarms before noalarms", "noalarms realarms", {"frmalarm.Timer2"},
+          {"Alarm Log Reset: The Alarm or Alarms have been reset"});
+    order("noalarms before almlog", "almlog noalarms", {"frmalarm.Timer2"},
+          {"No Alarms: There were no alarms logged to reset"});
+    order("almlog before alm-new", "alm-new\ralmlog", {"frmalarm.alarm_do:alm-new\r\nalmlog"}, none);
+    order("alm-new before nocomp", "nocomp alm-new", {"frmalarm.showMaximised", "frmalarm.uploadnew_Click"},
+          none);
+    order("nocomp before tempfront", "tempfront nocomp", none,
+          {"Glacinor Invaild: The Glacinor is not configured for computer communications,"});
+    order("tempfront before dxstart", "dxstart tempfront", {"frmfront.Front_do"}, none);
+    order("dxstart before evapfrst", "evapfrst dxstart", {"frmbrumalet.start_do"}, none);
 }
 
 void TestCcForm1Engine::dispatch()
@@ -208,12 +303,17 @@ void TestCcForm1Engine::dispatch()
     QFETCH(int, open);
     QFETCH(QString, version);
     QFETCH(QStringList, calls);
+    QFETCH(QStringList, said);
     QFETCH(bool, cleared);
     Rig rig;
     rig.open(open);
     rig.globals.instrument_version = version;
     rig.line->deliver(reply);
     QCOMPARE(rig.views.calls, calls);
+    QStringList shown;
+    for (const Operator::Message& m : rig.op.messages())
+        shown << m.title + ": " + m.lines.value(0);
+    QCOMPARE(shown, said);
     QCOMPARE(rig.engine->test3.isEmpty(), cleared);
 }
 
@@ -375,7 +475,8 @@ void TestCcForm1Engine::resetOnEstablishedLine()
     rig.line->deliver(identity("9.6", "00012"));
     rig.line->deliver("AT&FE0\r");
     QCOMPARE(rig.op.titles(), QStringList{"No Response"});
-    QCOMPARE(rig.views.calls, (QStringList{"Toolbar1", "channels.Timer5", "unload upload"}));
+    QCOMPARE(rig.views.calls,
+             (QStringList{"MDIForm1.Toolbar1", "channels.Timer5", "MDIForm1.unload upload"}));
     QVERIFY(!rig.line->isOpen());
     QCOMPARE(rig.engine->Text3[2].text, QStringLiteral("Port Closed"));
     QCOMPARE(rig.engine->version.text, QStringLiteral("????"));
@@ -578,11 +679,11 @@ void TestCcForm1Engine::newAlarm_data()
     QTest::newRow("status cycle running holds it back")
         << int(Status) << true << QStringList{} << QStringList{"Alarm Active"};
     QTest::newRow("status stopped opens the alarm view")
-        << int(Status) << false << QStringList{"mnualarmon_Click", "uploadnew_Click"} << QStringList{};
+        << int(Status) << false << QStringList{"MDIForm1.mnualarmon_Click", "frmalarm.uploadnew_Click"} << QStringList{};
     QTest::newRow("graphic cycle does not hold it back")
-        << int(StatusG) << true << QStringList{"mnualarmon_Click", "uploadnew_Click"} << QStringList{};
+        << int(StatusG) << true << QStringList{"MDIForm1.mnualarmon_Click", "frmalarm.uploadnew_Click"} << QStringList{};
     QTest::newRow("alarm view open is maximised")
-        << int(Alarm) << false << QStringList{"showMaximised", "uploadnew_Click"} << QStringList{};
+        << int(Alarm) << false << QStringList{"frmalarm.showMaximised", "frmalarm.uploadnew_Click"} << QStringList{};
 }
 
 void TestCcForm1Engine::newAlarm()
@@ -593,7 +694,7 @@ void TestCcForm1Engine::newAlarm()
     QFETCH(QStringList, titles);
     Rig rig;
     rig.open(open);
-    rig.views.cycleRunning = cycle;
+    rig.views.status.cycleRunning = rig.views.statusg.cycleRunning = cycle;
     rig.line->deliver("alm-new");
     QCOMPARE(rig.views.calls, calls);
     QCOMPARE(rig.op.titles(), titles);
@@ -631,16 +732,9 @@ void TestCcForm1Engine::settingsLiveInTheInstrumentsInfoRows()
     QTemporaryDir dir;
     std::unique_ptr<Store> store = Store::create(dir.filePath("t-12.db"), 1);
     QVERIFY(store);
-    QList<Store::Column> columns;
-    for (int c = 0; c < 42; ++c)
-        columns.append({QStringLiteral("f%1").arg(c), Store::ColumnType::Text});
-    QVERIFY(store->createTable("info", columns));
-    std::unique_ptr<Recordset> info = store->openRecordset("info");
-    const QStringList stored = {"", "", "4800,e,7,2", "/dev/ttyACM3", "1", "7", "&C1", "2"};
-    for (const QString& v : stored) {
-        QVERIFY(info->AddNew() && info->setValue(41, v.isEmpty() ? QVariant() : QVariant(v))
-                && info->Update());
-    }
+    std::unique_ptr<Recordset> info =
+        infoTable(*store, {"", "", "4800,e,7,2", "/dev/ttyACM3", "1", "7", "&C1", "2"});
+    QVERIFY(info);
 
     Rig rig(false);
     rig.engine->setInstrument("12", "555", info.get());
@@ -664,6 +758,237 @@ void TestCcForm1Engine::settingsLiveInTheInstrumentsInfoRows()
     QCOMPARE(info->cell(7, 41).toInt(), 0);
     QCOMPARE(rig.settings.value("Settings").toString(), QStringLiteral("4800,n,8,1"));
     QCOMPARE(rig.line->settings().toText(), QStringLiteral("4800,n,8,1"));
+}
+
+void TestCcForm1Engine::newInstrumentGetsTheDefaults_data()
+{
+    QTest::addColumn<QStringList>("stored"); // rows 0 to 7 of field 41
+    QTest::newRow("empty rows") << QStringList{"", "", "", "", "", "", "", ""};
+    QTest::newRow("unreadable rows") << QStringList{"", "", "fast", "", "2", "x", "", "9"};
+}
+
+void TestCcForm1Engine::newInstrumentGetsTheDefaults()
+{
+    QFETCH(QStringList, stored);
+    QTemporaryDir dir;
+    std::unique_ptr<Store> store = Store::create(dir.filePath("t-13.db"), 1);
+    QVERIFY(store);
+    std::unique_ptr<Recordset> info = infoTable(*store, stored);
+    QVERIFY(info);
+
+    // Another instrument was used last, on other settings.
+    Rig rig(true);
+    rig.engine->cboPort_Change(QStringLiteral("/dev/ttyACM3"));
+    rig.engine->cboSpeed_Click(4);
+    rig.engine->optFlow_Click(2);
+    rig.engine->cmdOK_Click();
+    rig.engine->setInstrument("13", "555", info.get());
+    rig.engine->LoadPropertySettings();
+
+    // 9600,n,8,1, modem, waiting for the dial tone, no flow control; written back.
+    QCOMPARE(rig.line->settings().toText(), QStringLiteral("9600,n,8,1"));
+    QCOMPARE(info->cell(2, 41).toString(), QStringLiteral("9600,n,8,1"));
+    QCOMPARE(info->cell(4, 41).toString(), QStringLiteral("0"));
+    QCOMPARE(info->cell(5, 41).toString(), QStringLiteral("0"));
+    QCOMPARE(info->cell(7, 41).toString(), QStringLiteral("0"));
+    QCOMPARE(rig.line->handshaking(), Handshaking::None);
+    QVERIFY(rig.engine->Option2[0].value.toBool());
+    QVERIFY(rig.engine->CommPort() != QStringLiteral("/dev/ttyACM3"));
+    QCOMPARE(info->cell(3, 41).toString(), rig.engine->CommPort());
+}
+
+void TestCcForm1Engine::modemResultHangsUp_data()
+{
+    QTest::addColumn<bool>("online");
+    QTest::addColumn<QByteArray>("reply");
+    QTest::addColumn<QStringList>("message"); // title, then the lines
+    QTest::addColumn<QByteArray>("hangUp");
+    QTest::addColumn<bool>("dialled");
+    QTest::newRow("no dial tone")
+        << false << QByteArray("\r\nNO DIALTONE\r\n")
+        << QStringList{"No Dial Tone", "There was no dial tone detected.",
+                       "Make sure the phone line is connected"}
+        << QByteArray("ATH0\r\n") << true;
+    QTest::newRow("no carrier while dialling")
+        << false << QByteArray("\r\nNO CARRIER\r\n")
+        << QStringList{"Busy", "No carrier signal.", "Check the modem at the other end."}
+        << QByteArray() << false;
+    QTest::newRow("carrier lost on line")
+        << true << QByteArray("NO CARRIER\r\n")
+        << QStringList{"Busy", "No carrier signal.", "Check the modem at the other end."}
+        << QByteArray() << false;
+}
+
+void TestCcForm1Engine::modemResultHangsUp()
+{
+    QFETCH(bool, online);
+    QFETCH(QByteArray, reply);
+    QFETCH(QStringList, message);
+    QFETCH(QByteArray, hangUp);
+    QFETCH(bool, dialled);
+    Rig rig(false);
+    if (online)
+        rig.dialAndConnect();
+    else
+        rig.engine->dial_num_Click();
+    rig.line->clearWrites();
+    rig.line->deliver(reply);
+    QCOMPARE(rig.op.messages().size(), 1);
+    QCOMPARE(QStringList{rig.op.last().title} + rig.op.last().lines, message);
+    // "dialled" cleared first: the hang-up then sends nothing to the modem.
+    QCOMPARE(rig.line->written(), hangUp);
+    QCOMPARE(rig.engine->dialled, dialled);
+    QVERIFY(!rig.line->isOpen());
+    QVERIFY(!rig.globals.link_up);
+    QCOMPARE(rig.engine->Text3[3].text, QStringLiteral("Port Closed"));
+    QVERIFY(rig.engine->dial_num.enabled && !rig.engine->cancel_dial.enabled);
+    QVERIFY(rig.engine->test3.isEmpty());
+    QVERIFY(!rig.engine->Timer1.Enabled());
+}
+
+void TestCcForm1Engine::silenceAfterDial_data()
+{
+    QTest::addColumn<bool>("direct");
+    QTest::addColumn<int>("waitMs");
+    QTest::addColumn<QStringList>("message");
+    const QString second = QStringLiteral("Check that it is turned on and the cables are properly connected");
+    QTest::newRow("modem") << false << 50000
+                           << QStringList{"No Modem", "The modem has not responded", second};
+    QTest::newRow("direct") << true << 30000
+                            << QStringList{"No Glacinor", "The Glacinor has not responded", second};
+}
+
+void TestCcForm1Engine::silenceAfterDial()
+{
+    QFETCH(bool, direct);
+    QFETCH(int, waitMs);
+    QFETCH(QStringList, message);
+    Rig rig(direct);
+    rig.engine->dial_num_Click();
+    rig.clock.advance(waitMs - 1);
+    QVERIFY(rig.op.messages().isEmpty());
+    rig.clock.advance(1);
+    QCOMPARE(rig.op.messages().size(), 1);
+    QCOMPARE(QStringList{rig.op.last().title} + rig.op.last().lines, message);
+    QVERIFY(!rig.line->isOpen());
+    QCOMPARE(rig.engine->Text3[3].text, QStringLiteral("Port Closed"));
+
+    // Any arrival ends the wait.
+    rig.op.clear();
+    rig.engine->dial_num_Click();
+    rig.line->deliver("\r\n");
+    rig.clock.advance(waitMs * 2);
+    QVERIFY(rig.op.messages().isEmpty());
+    QVERIFY(rig.line->isOpen());
+}
+
+void TestCcForm1Engine::lineEvents_data()
+{
+    QTest::addColumn<int>("code");
+    QTest::addColumn<QString>("status"); // the status panel afterwards
+    QTest::addColumn<bool>("closes");    // the comms error path with the same text
+    QTest::newRow("3") << 3 << "Status: Change in CTS Detected" << false;
+    QTest::newRow("4") << 4 << "Status: Change in DSR Detected" << false;
+    QTest::newRow("6") << 6 << "Status: The Phone is Ringing" << false;
+    QTest::newRow("7") << 7 << "Status: End of File Detected" << false;
+    QTest::newRow("1 send") << 1 << "Status: " << false;
+    QTest::newRow("1001 break") << 1001 << "Status: " << false;
+    QTest::newRow("1004 framing") << 1004 << "Status: " << false;
+    QTest::newRow("1006 overrun") << 1006 << "Status: " << false;
+    QTest::newRow("1009 parity") << 1009 << "Status: " << false;
+    QTest::newRow("1002") << 1002 << "Status: CTS Timeout" << true;
+    QTest::newRow("1003") << 1003 << "Status: DSR Timeout" << true;
+    QTest::newRow("1007") << 1007 << "Status: Carrier Detect Timeout" << true;
+    QTest::newRow("1008") << 1008 << "Status: Receive Buffer Overflow" << true;
+    QTest::newRow("1011") << 1011 << "Status: Error retrieving DCB" << true;
+    QTest::newRow("1005 unknown") << 1005 << "Status: Unknown error or event" << true;
+}
+
+void TestCcForm1Engine::lineEvents()
+{
+    QFETCH(int, code);
+    QFETCH(QString, status);
+    QFETCH(bool, closes);
+    Rig rig;
+    rig.engine->Command3_Click();
+    rig.line->raiseEvent(code);
+    QCOMPARE(rig.engine->sbrStatus[1].text, status);
+    QCOMPARE(rig.line->isOpen(), !closes);
+    QCOMPARE(rig.globals.link_up, !closes);
+    if (closes)
+        QCOMPARE(rig.op.last().lines,
+                 (QStringList{status.mid(8), QStringLiteral("Check communication setup")}));
+    else
+        QVERIFY(rig.op.messages().isEmpty());
+}
+
+void TestCcForm1Engine::badIdentityHangsUpTheCall_data()
+{
+    QTest::addColumn<QByteArray>("reply");
+    QTest::addColumn<QString>("title");
+    QTest::newRow("wrong ID") << identity("9.6", "00013") << "Wrong ID";
+    QTest::newRow("version not numeric") << identity("V9x", "00012") << "Invalid Version Number";
+    QTest::newRow("ID not numeric") << identity("14", "0001A") << "Invalid ID Number";
+}
+
+void TestCcForm1Engine::badIdentityHangsUpTheCall()
+{
+    QFETCH(QByteArray, reply);
+    QFETCH(QString, title);
+    Rig rig(false);
+    rig.dialAndConnect();
+    rig.clock.advance(2000);
+    rig.line->clearWrites();
+    rig.line->deliver(reply);
+    QCOMPARE(rig.op.titles(), QStringList{title});
+    // cancel_dial_Click with the modem on line: escape, then hang up.
+    QCOMPARE(rig.line->written(), QByteArray("+++ATH0\r\n"));
+    QVERIFY(!rig.globals.modem_online);
+    QVERIFY(!rig.line->isOpen());
+    QCOMPARE(rig.engine->Text3[3].text, QStringLiteral("Port Closed"));
+    QVERIFY(!rig.engine->Timer4.Enabled());
+    rig.clock.advance(60000);
+    QCOMPARE(rig.op.messages().size(), 1);
+}
+
+void TestCcForm1Engine::lostLineEndsTheLinkOnly_data()
+{
+    QTest::addColumn<bool>("direct");
+    QTest::newRow("direct") << true;
+    QTest::newRow("modem") << false;
+}
+
+void TestCcForm1Engine::lostLineEndsTheLinkOnly()
+{
+    QFETCH(bool, direct);
+    Rig rig(direct);
+    const auto connectAndIdentify = [&] {
+        if (direct) {
+            rig.engine->Command3_Click();
+        } else {
+            rig.dialAndConnect();
+            rig.clock.advance(2000);
+        }
+        rig.line->deliver(identity("9.6", "00012"));
+    };
+    connectAndIdentify();
+    QVERIFY(rig.globals.link_up);
+    rig.line->close(); // the device went away, and the line says so
+    rig.line->raiseEvent(Line::LineLost);
+    QCOMPARE(rig.op.titles(), QStringList{"Click Cancel to quit, OK to ignore."});
+    QVERIFY(!rig.globals.link_up);
+    QVERIFY(!rig.globals.modem_online);
+    QCOMPARE(rig.engine->Text3[direct ? 2 : 3].text, QStringLiteral("Port Closed"));
+    QVERIFY(direct ? rig.engine->Command3.enabled : rig.engine->dial_num.enabled);
+
+    // Nothing of it stays behind: the next link comes up and stays up.
+    rig.op.clear();
+    connectAndIdentify();
+    rig.line->deliver("status");
+    QCOMPARE(rig.op.titles(), QStringList{});
+    QVERIFY(rig.line->isOpen());
+    QVERIFY(rig.globals.link_up);
+    QCOMPARE(rig.engine->Text3[4].text, QStringLiteral("ID No. 12"));
 }
 
 QTEST_GUILESS_MAIN(TestCcForm1Engine)

@@ -11,7 +11,6 @@ private slots:
     void prefixLengthPerSender();
     void texts_data();
     void texts();
-    void tokensInDispatchOrder();
 };
 
 void TestCommands::prefixLengthPerSender_data()
@@ -67,19 +66,6 @@ void TestCommands::texts()
 {
     QFETCH(QByteArray, actual);
     QFETCH(QByteArray, expected);
-    QCOMPARE(actual, expected);
-}
-
-void TestCommands::tokensInDispatchOrder()
-{
-    const QStringList expected = {"NO DIALTONE", "BUSY",   "NO CARRIER", "CONNECT",  "Glacinor",
-                                  "sret",        "schanupload", "downcheck", "donedown", "AT&FE0",
-                                  "dlres",       "histy",  "plres",      "power",    "status",
-                                  "presss",      "torvan", "realarms",   "noalarms", "almlog",
-                                  "alm-new",     "nocomp", "tempfront",  "dxstart",  "evapfrst"};
-    QStringList actual;
-    for (Token t : tokenOrder())
-        actual << QString(tokenText(t));
     QCOMPARE(actual, expected);
 }
 
