@@ -7,7 +7,8 @@ constexpr char Eot = 4;
 }
 
 Instrument::Instrument(const Options& options, const Settings& settings, QObject* parent)
-    : QObject(parent), m_state(options), m_settings(settings)
+    : QObject(parent), m_state(options), m_settings(settings),
+      m_out([this](const QByteArray& bytes) { emit transmit(bytes); })
 {
 }
 
@@ -28,6 +29,7 @@ void Instrument::reset()
     m_pendingDownload.reset();
     m_chain = LogKind::None;
     m_chainRecords.clear();
+    m_out.clear();
     start();
 }
 
@@ -63,56 +65,43 @@ void Instrument::advance(qint64 realMs)
         m_modem = ModemState::OnlineCommand;
         modemSay("OK");
     }
-    if (m_state.takeNewAlarm())
-        m_almNewWaiting = true;
-    if (m_almNewWaiting && m_chain == LogKind::None && lineUp() && !m_faults.nocomp) {
-        m_almNewWaiting = false;
-        send("alm-new");
-    }
-    while (!m_queue.isEmpty() && m_queue.first().due <= m_now) {
-        const QByteArray bytes = m_queue.takeFirst().bytes;
-        if (lineUp() || bytes.startsWith("\r\n"))
-            emit transmit(bytes);
-    }
+    if (m_state.takeNewAlarm() && !m_faults.nocomp)
+        m_out.unasked("alm-new", m_now);
+    pump();
 }
 
-void Instrument::send(const QByteArray& bytes, int extraDelayMs)
+void Instrument::pump()
 {
     // Behind a modem without a call nothing of the instrument gets through.
+    if (!lineUp()) {
+        m_out.clear();
+        return;
+    }
+    // Never in the middle of a command or of a log upload.
+    const bool idle = m_parse == Parse::Start && m_chain == LogKind::None;
+    m_out.quietMs = m_settings.quietMs;
+    m_out.pump(m_now, idle, m_faults.batchBytes, m_faults.batchGapMs);
+}
+
+void Instrument::send(const QByteArray& bytes)
+{
     if (bytes.isEmpty() || !lineUp())
         return;
-    const int delay = m_faults.delayMs + extraDelayMs;
-    if (delay == 0 && m_faults.batchBytes <= 0 && m_queue.isEmpty()) {
-        emit transmit(bytes);
-        return;
-    }
-    qint64 due = m_now + delay;
-    if (extraDelayMs == 0 && !m_queue.isEmpty())
-        due = qMax(due, m_queue.last().due);
-    const int piece = m_faults.batchBytes > 0 ? m_faults.batchBytes : int(bytes.size());
-    for (int i = 0; i < bytes.size(); i += piece) {
-        Timed t {due, bytes.mid(i, piece)};
-        // Keep the queue in time order.
-        int at = int(m_queue.size());
-        while (at > 0 && m_queue[at - 1].due > t.due)
-            --at;
-        m_queue.insert(at, t);
-        due += m_faults.batchGapMs;
-    }
-    if (m_queue.first().due <= m_now)
-        advance(0);
+    m_out.reply(bytes, m_now, m_faults.delayMs);
+    pump();
 }
 
 void Instrument::receive(const QByteArray& bytes)
 {
     if (m_deafUntil >= 0 && m_now < m_deafUntil)
         return;
-    if (m_settings.modem) {
+    m_out.heard(m_now);
+    if (m_settings.modem)
         modemBytes(bytes);
-        return;
-    }
-    for (char c : bytes)
-        instrumentByte(c);
+    else
+        for (char c : bytes)
+            instrumentByte(c);
+    pump();
 }
 
 // ---------------------------------------------------------------- modem
@@ -393,8 +382,10 @@ void Instrument::command(const QByteArray& body)
         if (!ok)
             return;
         reply(kind, brumaletStartReply(channel));
+        // The reading takes its time and then goes out like an unasked
+        // message: it holds back no other reply.
         if (!m_faults.nocomp)
-            send(brumaletReply(m_state, channel), m_settings.brumaletDelayMs);
+            m_out.unasked(brumaletReply(m_state, channel), m_now, m_settings.brumaletDelayMs);
         return;
     }
     case 'c':
