@@ -4,7 +4,15 @@ namespace sim {
 
 namespace {
 constexpr char Eot = 4;
+
+bool hasTwoByteKeys(double version)
+{
+    for (double v : {8.9, 9.1, 9.6, 9.8})
+        if (qFuzzyCompare(version, v))
+            return true;
+    return false;
 }
+} // namespace
 
 Instrument::Instrument(const Options& options, const Settings& settings, QObject* parent)
     : QObject(parent), m_state(options), m_settings(settings),
@@ -236,7 +244,10 @@ void Instrument::instrumentByte(char ch)
         command(QByteArray());
         return;
     }
-    if (c >= 164 && c < 164 + 16) {
+    // A version reads its keys in one form only: "g"/"h" and a key code, or
+    // one byte from 164 on. The other form is noise to it.
+    const bool twoByteKeys = hasTwoByteKeys(m_state.versionNumber());
+    if (c >= 164 && c < 164 + 16 && !twoByteKeys) {
         m_counts["key"]++;
         key(c - 164);
         return;
@@ -250,7 +261,8 @@ void Instrument::instrumentByte(char ch)
         return;
     case 'g':
     case 'h':
-        m_parse = Parse::KeyCode;
+        if (twoByteKeys)
+            m_parse = Parse::KeyCode;
         return;
     case 'C': case 'F': case 'T': case 't': case 'J': case 'c': case 'a': case 'd': case 'P':
     case 'D': case 'b': case 'E': case 'S': case 'U': case 'Q': case 's': case 'u': case 'q':
@@ -407,6 +419,11 @@ void Instrument::command(const QByteArray& body)
         QByteArray parts = args;
         if (parts.endsWith(','))
             parts.chop(1);
+        // What the instrument cannot hold it does not echo: the sender's
+        // wait runs out and it breaks the dialogue off.
+        m_pendingWrite.reset();
+        if (!m_state.acceptsWrite(parts.split(',')))
+            return;
         m_pendingWrite = parts.split(',');
         echo(kind, parts + ",sret");
         return;

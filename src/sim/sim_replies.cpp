@@ -268,13 +268,12 @@ bool takeDownloadRecord(InstrumentState& s, const QByteArray& record)
     }
     if (parts.size() != items.size() + 2)
         return false;
+    // A record with a value the instrument cannot hold is not taken at all.
     QVector<int> values(items.size());
     for (int i = 0; i < items.size(); ++i) {
-        if (items[i]->field == DescriptionField)
-            continue;
-        values[i] = parts[i + 1].trimmed().toInt(&ok);
-        if (!ok)
+        if (!s.fieldHolds(items[i]->field, parts[i + 1]))
             return false;
+        values[i] = parts[i + 1].toInt();
     }
     for (int i = 0; i < items.size(); ++i) {
         if (items[i]->field == DescriptionField)

@@ -124,12 +124,19 @@ public:
     QByteArray description(int wire) const { return m_desc[wire]; }
     void setDescription(int wire, const QByteArray& d);
 
-    // Takes a write as the "P" command carries it: the comma separated parts
+    // A write as the "P" command carries it: the comma separated parts
     // behind "P" (function, channel, sub-function, width flag, value, group
     // size, further values), or a whole order for functions 65, 90 and 100.
-    // False when the instrument has no such function for that channel or a
-    // value is not a number.
+    // acceptsWrite is false when the instrument has no such function for
+    // that channel, or a value is not a whole number, is outside the
+    // function's range or does not fit its field; applyWrite then changes
+    // nothing. Both in sim_write.cpp.
+    bool acceptsWrite(const QList<QByteArray>& parts) const;
     bool applyWrite(const QList<QByteArray>& parts);
+    // Whether a field of the table can take a value of a downloaded record:
+    // a whole number that fits the field, or for the description six
+    // characters. Ranges are the business of single writes.
+    bool fieldHolds(int field, const QByteArray& text) const;
 
     const RoomState& room(int channel) const { return m_rooms[channel - 1]; } // 1..216
     // The reading of a channel as the replies carry it: value or special.
@@ -164,6 +171,7 @@ public:
     int brumaletKind(int channel) const;
 
 private:
+    void setCompressorKind(int row, int kind);
     void seed();
     void step(double seconds);
     void minuteEvents();
