@@ -462,9 +462,14 @@ void Instrument::startChain(LogKind kind, bool onlyNew)
     m_chainRecords.clear();
     m_chainPos = 0;
     QByteArray token, letter;
-    auto take = [&](auto& log, auto encode) {
+    // extra: records sent in front of the log's own; announcedLess: how
+    // many fewer the count announces than are sent.
+    auto take = [&](auto& log, auto encode, int extra = 0, int announcedLess = 0) {
         const int from = onlyNew ? log.firstNew : 0;
-        const int count = int(log.records.size()) - from;
+        const int sent = int(log.records.size()) - from + extra;
+        const int count = qMax(0, sent - announcedLess);
+        if (extra)
+            m_chainRecords << zeroHistoryRecord(count, sent > 1);
         for (int i = from; i < log.records.size(); ++i)
             m_chainRecords << encode(log.records[i], count, i + 1 < log.records.size());
         m_chainEnd = log.dropped + log.records.size();
@@ -475,7 +480,7 @@ void Instrument::startChain(LogKind kind, bool onlyNew)
         token = "almlog", letter = onlyNew ? "b" : "D";
         break;
     case LogKind::History:
-        take(m_state.history, historyRecord);
+        take(m_state.history, historyRecord, m_state.quirks.zeroRecord ? 1 : 0, m_state.quirks.uncounted);
         token = "histy", letter = onlyNew ? "U" : "S";
         break;
     case LogKind::Power:

@@ -101,6 +101,26 @@ struct Options {
     int historyHours = 24; // plant run before start, to fill the logs
 };
 
+// Odd but possible replies, asked for by scenario lines so that tests can
+// reach them. None is on by default.
+struct Quirks {
+    // Pressure, Torvanel and evaporator replies write their numbers as a
+    // sign and zeros ("+00450", "-01000") instead of blanks and digits.
+    bool zeroPadded = false;
+    // Bank 1's pressures, the liquid level, Torvanel 1's temperatures and
+    // pressures, the first Torvanel temperature and the evaporator's coil
+    // and air temperatures read this special value (-1000 to -1004); 0 off.
+    int special = 0;
+    // The data log upload announces this many records fewer than it sends.
+    int uncounted = 0;
+    // The data log upload starts with a record that is zero throughout.
+    bool zeroRecord = false;
+    // The pressure reply carries compressors 1 and 2 in each other's place.
+    bool compressorsSwapped = false;
+    // The Torvanel's kind, its first further input (1 reads table B); -1 none.
+    std::array<int, 27> torvanelKind = [] { std::array<int, 27> k; k.fill(-1); return k; }();
+};
+
 // The instrument's memory and its plant. Time moves only by advance(), in
 // plant milliseconds, so that tests and the --speed option drive it alike.
 class InstrumentState {
@@ -155,6 +175,10 @@ public:
     int condenserCount() const;
     bool torvanelAlarm(int s, int i) const;
     void setTorvanelAlarm(int s, int i, bool on);
+
+    Quirks quirks;
+    // Field 165 set as the front panel would, without the write checks.
+    void forceCompressorKind(int row, int kind) { setCompressorKind(row, kind); }
 
     Log<AlarmRecord> alarms;
     Log<HistoryRecord> history;
