@@ -247,7 +247,7 @@ QByteArray channelRecord(const InstrumentState& s, int wire)
         const int width = item.width ? item.width : (wideCompressorType(v) ? 6 : 1);
         // A compressor kind above 9 does not fit the narrow field: the
         // instrument writes it whole, and the rest of the record moves on.
-        if (item.width == 0 && width == 1 && s.field(wire, item.field) > 9)
+        if (item.width == 0 && width == 1 && s.field(wire, item.field) > 9 && s.quirks.wideKinds)
             r += QByteArray::number(s.field(wire, item.field));
         else
             r += num(s.field(wire, item.field), width);

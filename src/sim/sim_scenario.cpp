@@ -83,8 +83,10 @@ bool applyQuirk(InstrumentState& s, const QString& key, const QString& value, bo
             q.torvanelKind[n - 1] = k;
     } else if (key == QLatin1String("compressor_kind")) {
         ok = pair(value, 1, 27, n, k) && k >= 0 && k <= 99;
-        if (ok)
+        if (ok) {
             s.forceCompressorKind(n - 1, k);
+            q.wideKinds = true;
+        }
     } else {
         return false;
     }

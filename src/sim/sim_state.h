@@ -117,6 +117,9 @@ struct Quirks {
     bool zeroRecord = false;
     // The pressure reply carries compressors 1 and 2 in each other's place.
     bool compressorsSwapped = false;
+    // Set by a kind forced from a scenario: a compressor kind above 9 is
+    // written whole in the narrow field of the older channel record.
+    bool wideKinds = false;
     // The Torvanel's kind, its first further input (1 reads table B); -1 none.
     std::array<int, 27> torvanelKind = [] { std::array<int, 27> k; k.fill(-1); return k; }();
 };
