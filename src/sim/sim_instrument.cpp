@@ -4,10 +4,19 @@ namespace sim {
 
 namespace {
 constexpr char Eot = 4;
+
+bool hasTwoByteKeys(double version)
+{
+    for (double v : {8.9, 9.1, 9.6, 9.8})
+        if (qFuzzyCompare(version, v))
+            return true;
+    return false;
 }
+} // namespace
 
 Instrument::Instrument(const Options& options, const Settings& settings, QObject* parent)
-    : QObject(parent), m_state(options), m_settings(settings)
+    : QObject(parent), m_state(options), m_settings(settings),
+      m_out([this](const QByteArray& bytes) { emit transmit(bytes); })
 {
 }
 
@@ -28,6 +37,7 @@ void Instrument::reset()
     m_pendingDownload.reset();
     m_chain = LogKind::None;
     m_chainRecords.clear();
+    m_out.clear();
     start();
 }
 
@@ -63,56 +73,43 @@ void Instrument::advance(qint64 realMs)
         m_modem = ModemState::OnlineCommand;
         modemSay("OK");
     }
-    if (m_state.takeNewAlarm())
-        m_almNewWaiting = true;
-    if (m_almNewWaiting && m_chain == LogKind::None && lineUp() && !m_faults.nocomp) {
-        m_almNewWaiting = false;
-        send("alm-new");
-    }
-    while (!m_queue.isEmpty() && m_queue.first().due <= m_now) {
-        const QByteArray bytes = m_queue.takeFirst().bytes;
-        if (lineUp() || bytes.startsWith("\r\n"))
-            emit transmit(bytes);
-    }
+    if (m_state.takeNewAlarm() && !m_faults.nocomp)
+        m_out.unasked("alm-new", m_now);
+    pump();
 }
 
-void Instrument::send(const QByteArray& bytes, int extraDelayMs)
+void Instrument::pump()
 {
     // Behind a modem without a call nothing of the instrument gets through.
+    if (!lineUp()) {
+        m_out.clear();
+        return;
+    }
+    // Never in the middle of a command or of a log upload.
+    const bool idle = m_parse == Parse::Start && m_chain == LogKind::None;
+    m_out.quietMs = m_settings.quietMs;
+    m_out.pump(m_now, idle, m_faults.batchBytes, m_faults.batchGapMs);
+}
+
+void Instrument::send(const QByteArray& bytes)
+{
     if (bytes.isEmpty() || !lineUp())
         return;
-    const int delay = m_faults.delayMs + extraDelayMs;
-    if (delay == 0 && m_faults.batchBytes <= 0 && m_queue.isEmpty()) {
-        emit transmit(bytes);
-        return;
-    }
-    qint64 due = m_now + delay;
-    if (extraDelayMs == 0 && !m_queue.isEmpty())
-        due = qMax(due, m_queue.last().due);
-    const int piece = m_faults.batchBytes > 0 ? m_faults.batchBytes : int(bytes.size());
-    for (int i = 0; i < bytes.size(); i += piece) {
-        Timed t {due, bytes.mid(i, piece)};
-        // Keep the queue in time order.
-        int at = int(m_queue.size());
-        while (at > 0 && m_queue[at - 1].due > t.due)
-            --at;
-        m_queue.insert(at, t);
-        due += m_faults.batchGapMs;
-    }
-    if (m_queue.first().due <= m_now)
-        advance(0);
+    m_out.reply(bytes, m_now, m_faults.delayMs);
+    pump();
 }
 
 void Instrument::receive(const QByteArray& bytes)
 {
     if (m_deafUntil >= 0 && m_now < m_deafUntil)
         return;
-    if (m_settings.modem) {
+    m_out.heard(m_now);
+    if (m_settings.modem)
         modemBytes(bytes);
-        return;
-    }
-    for (char c : bytes)
-        instrumentByte(c);
+    else
+        for (char c : bytes)
+            instrumentByte(c);
+    pump();
 }
 
 // ---------------------------------------------------------------- modem
@@ -247,7 +244,10 @@ void Instrument::instrumentByte(char ch)
         command(QByteArray());
         return;
     }
-    if (c >= 164 && c < 164 + 16) {
+    // A version reads its keys in one form only: "g"/"h" and a key code, or
+    // one byte from 164 on. The other form is noise to it.
+    const bool twoByteKeys = hasTwoByteKeys(m_state.versionNumber());
+    if (c >= 164 && c < 164 + 16 && !twoByteKeys) {
         m_counts["key"]++;
         key(c - 164);
         return;
@@ -261,7 +261,8 @@ void Instrument::instrumentByte(char ch)
         return;
     case 'g':
     case 'h':
-        m_parse = Parse::KeyCode;
+        if (twoByteKeys)
+            m_parse = Parse::KeyCode;
         return;
     case 'C': case 'F': case 'T': case 't': case 'J': case 'c': case 'a': case 'd': case 'P':
     case 'D': case 'b': case 'E': case 'S': case 'U': case 'Q': case 's': case 'u': case 'q':
@@ -393,8 +394,10 @@ void Instrument::command(const QByteArray& body)
         if (!ok)
             return;
         reply(kind, brumaletStartReply(channel));
+        // The reading takes its time and then goes out like an unasked
+        // message: it holds back no other reply.
         if (!m_faults.nocomp)
-            send(brumaletReply(m_state, channel), m_settings.brumaletDelayMs);
+            m_out.unasked(brumaletReply(m_state, channel), m_now, m_settings.brumaletDelayMs);
         return;
     }
     case 'c':
@@ -416,6 +419,11 @@ void Instrument::command(const QByteArray& body)
         QByteArray parts = args;
         if (parts.endsWith(','))
             parts.chop(1);
+        // What the instrument cannot hold it does not echo: the sender's
+        // wait runs out and it breaks the dialogue off.
+        m_pendingWrite.reset();
+        if (!m_state.acceptsWrite(parts.split(',')))
+            return;
         m_pendingWrite = parts.split(',');
         echo(kind, parts + ",sret");
         return;
@@ -454,9 +462,14 @@ void Instrument::startChain(LogKind kind, bool onlyNew)
     m_chainRecords.clear();
     m_chainPos = 0;
     QByteArray token, letter;
-    auto take = [&](auto& log, auto encode) {
+    // extra: records sent in front of the log's own; announcedLess: how
+    // many fewer the count announces than are sent.
+    auto take = [&](auto& log, auto encode, int extra = 0, int announcedLess = 0) {
         const int from = onlyNew ? log.firstNew : 0;
-        const int count = int(log.records.size()) - from;
+        const int sent = int(log.records.size()) - from + extra;
+        const int count = qMax(0, sent - announcedLess);
+        if (extra)
+            m_chainRecords << zeroHistoryRecord(count, sent > 1);
         for (int i = from; i < log.records.size(); ++i)
             m_chainRecords << encode(log.records[i], count, i + 1 < log.records.size());
         m_chainEnd = log.dropped + log.records.size();
@@ -467,7 +480,7 @@ void Instrument::startChain(LogKind kind, bool onlyNew)
         token = "almlog", letter = onlyNew ? "b" : "D";
         break;
     case LogKind::History:
-        take(m_state.history, historyRecord);
+        take(m_state.history, historyRecord, m_state.quirks.zeroRecord ? 1 : 0, m_state.quirks.uncounted);
         token = "histy", letter = onlyNew ? "U" : "S";
         break;
     case LogKind::Power:

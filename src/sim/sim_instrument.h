@@ -1,5 +1,6 @@
 #pragma once
 
+#include "sim/sim_outbox.h"
 #include "sim/sim_replies.h"
 #include "sim/sim_state.h"
 
@@ -49,6 +50,8 @@ public:
         double speed = 1;
         int brumaletDelayMs = 2500;
         int guardMs = 1000;
+        // Silence the line keeps around an unasked message.
+        int quietMs = 100;
     };
 
     Instrument(const Options& options, const Settings& settings, QObject* parent = nullptr);
@@ -88,7 +91,8 @@ private:
     void modemSay(const QByteArray& text);
     void reply(const QByteArray& kind, const QByteArray& text);
     void echo(const QByteArray& kind, QByteArray text);
-    void send(const QByteArray& bytes, int extraDelayMs = 0);
+    void send(const QByteArray& bytes);
+    void pump();
     bool lineUp() const;
     void startChain(LogKind kind, bool onlyNew);
     void nextInChain();
@@ -103,11 +107,7 @@ private:
     qint64 m_now = 0;
     double m_plantCarry = 0;
     qint64 m_deafUntil = -1;
-    struct Timed {
-        qint64 due;
-        QByteArray bytes;
-    };
-    QList<Timed> m_queue;
+    Outbox m_out;
 
     Parse m_parse = Parse::Start;
     QByteArray m_body;
@@ -122,7 +122,6 @@ private:
     QList<QByteArray> m_chainRecords; // encoded when the upload is asked for
     int m_chainPos = 0;
     qint64 m_chainEnd = 0;
-    bool m_almNewWaiting = false;
 
     ModemState m_modem = ModemState::Command;
     QByteArray m_modemLine;

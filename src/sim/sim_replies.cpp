@@ -75,20 +75,25 @@ QByteArray pressureReply(const InstrumentState& s)
 {
     const double v = s.versionNumber();
     // From version 6 the Torvanel data (216 fields of 6) close the reply.
+    const Quirks& q = s.quirks;
     Layout r(v >= 6 ? 1384 + 216 * 6 : 1384);
+    r.setZeroPadded(q.zeroPadded);
     r.put(1, stamp(s.now()));
     for (int b = 0; b < 5; ++b) {
         const bool used = b < s.banks();
-        r.putNum(18 * b + 20, used ? s.suctionPressure(b) : NotConnected, 6);
-        r.putNum(18 * b + 26, used ? s.dischargePressure(b) : NotConnected, 6);
-        r.putNum(18 * b + 32, used ? s.liquidPressure(b) : NotConnected, 6);
+        const bool odd = b == 0 && q.special;
+        r.putNum(18 * b + 20, odd ? q.special : used ? s.suctionPressure(b) : NotConnected, 6);
+        r.putNum(18 * b + 26, odd ? q.special : used ? s.dischargePressure(b) : NotConnected, 6);
+        r.putNum(18 * b + 32, odd ? q.special : used ? s.liquidPressure(b) : NotConnected, 6);
     }
-    r.putNum(110, s.liquidLevel(), 6);
+    r.putNum(110, q.special ? q.special : s.liquidLevel(), 6);
     const int comps = s.compressorCount();
     for (int i = 0; i < 27; ++i)
         r.putFlag(i + 116, i < comps && s.compressor(i).equalizer);
     for (int i = 0; i < 27; ++i) {
-        const int base = 27 * i;
+        // Swapped, compressor 1's record stands in place 2 and the other way.
+        const int place = q.compressorsSwapped && i < 2 ? 1 - i : i;
+        const int base = 27 * place;
         const bool used = i < comps;
         const Compressor& c = s.compressor(i);
         const int kind = wireKind(s.field(i, 165));
@@ -139,18 +144,21 @@ QByteArray pressureReply(const InstrumentState& s)
                 if (base + offset + text.size() - 1 <= 1385 + 216 * 6 - 1)
                     r.put(base + offset, text);
             };
+            const bool odd = t == 0 && q.special;
             for (int i = 0; i < 4; ++i) {
-                put(6 * i, num(fitted ? temps[i] : NotConnected, 6));
-                put(24 + 6 * i, num(fitted ? press[i] : NotConnected, 6));
+                put(6 * i, r.number(odd ? q.special : fitted ? temps[i] : NotConnected, 6));
+                put(24 + 6 * i, r.number(odd ? q.special : fitted ? press[i] : NotConnected, 6));
             }
-            put(48, num(fitted ? 40 * c.running : NotConnected, 6));
+            put(48, r.number(fitted ? 40 * c.running : NotConnected, 6));
             for (int i = 0; i < 16; ++i)
                 put(54 + i, (fitted && ((i == 0 && c.running) || (i == 6 && c.running >= c.units))) ? "1" : "0");
-            put(70, num(fitted ? 75 : NotConnected, 6));
+            put(70, r.number(fitted ? 75 : NotConnected, 6));
             put(76, "      ");
             for (int i = 0; i < 8; ++i)
                 put(82 + i, "0");
-            put(90, num(fitted ? 60 : NotConnected, 6));
+            if (t < 27 && q.torvanelKind[t] >= 0)
+                put(82, QByteArray::number(q.torvanelKind[t] % 10));
+            put(90, r.number(fitted ? 60 : NotConnected, 6));
         }
     }
     return r.text() + "presss";
@@ -159,6 +167,7 @@ QByteArray pressureReply(const InstrumentState& s)
 QByteArray torvanelReply(const InstrumentState& s)
 {
     Layout r;
+    r.setZeroPadded(s.quirks.zeroPadded);
     r.put(1, stamp(s.now()));
     for (int t = 0; t < 27; ++t)
         for (int i = 0; i < 40; ++i)
@@ -166,7 +175,9 @@ QByteArray torvanelReply(const InstrumentState& s)
     if (s.versionNumber() >= 8.8)
         for (int i = 0; i < 5; ++i) {
             // Saturated suction temperature of each group, roughly.
-            const int value = i < s.banks() ? s.suctionPressure(i) / 3 - 400 : NotConnected;
+            int value = i < s.banks() ? s.suctionPressure(i) / 3 - 400 : NotConnected;
+            if (i == 0 && s.quirks.special)
+                value = s.quirks.special;
             r.putNum(6 * i + 1100, value, 6);
         }
     return r.text() + "torvan";
@@ -234,7 +245,12 @@ QByteArray channelRecord(const InstrumentState& s, int wire)
             continue;
         }
         const int width = item.width ? item.width : (wideCompressorType(v) ? 6 : 1);
-        r += num(s.field(wire, item.field), width);
+        // A compressor kind above 9 does not fit the narrow field: the
+        // instrument writes it whole, and the rest of the record moves on.
+        if (item.width == 0 && width == 1 && s.field(wire, item.field) > 9 && s.quirks.wideKinds)
+            r += QByteArray::number(s.field(wire, item.field));
+        else
+            r += num(s.field(wire, item.field), width);
     }
     return r + "schanupload";
 }
@@ -268,13 +284,12 @@ bool takeDownloadRecord(InstrumentState& s, const QByteArray& record)
     }
     if (parts.size() != items.size() + 2)
         return false;
+    // A record with a value the instrument cannot hold is not taken at all.
     QVector<int> values(items.size());
     for (int i = 0; i < items.size(); ++i) {
-        if (items[i]->field == DescriptionField)
-            continue;
-        values[i] = parts[i + 1].trimmed().toInt(&ok);
-        if (!ok)
+        if (!s.fieldHolds(items[i]->field, parts[i + 1]))
             return false;
+        values[i] = parts[i + 1].toInt();
     }
     for (int i = 0; i < items.size(); ++i) {
         if (items[i]->field == DescriptionField)
@@ -322,6 +337,15 @@ QByteArray historyRecord(const HistoryRecord& h, int count, bool more)
     }
     r += flags + values + signedNum(more ? 0 : 1, 6);
     return r + "histy";
+}
+
+QByteArray zeroHistoryRecord(int count, bool more)
+{
+    QByteArray r = "00/00/" + signedNum(0, 6) + "00:00" + signedNum(count, 6);
+    r += QByteArray(Channels, '1') + QByteArray(224 - Channels, '0');
+    for (int i = 0; i < Channels; ++i)
+        r += signedNum(0, 6);
+    return r + signedNum(more ? 0 : 1, 6) + "histy";
 }
 
 QByteArray powerRecord(const PowerRecord& p, int count, bool more)
@@ -474,10 +498,13 @@ QByteArray brumaletStartReply(int channel)
 QByteArray brumaletReply(const InstrumentState& s, int channel)
 {
     Layout r;
+    r.setZeroPadded(s.quirks.zeroPadded);
     r.put(1, num(channel, 7));
     r.put(8, stamp(s.now()));
     const int kind = s.brumaletKind(channel);
-    const int room = channel >= 1 && channel <= Channels ? s.reading(channel) : NotConnected;
+    int room = channel >= 1 && channel <= Channels ? s.reading(channel) : NotConnected;
+    if (s.quirks.special)
+        room = s.quirks.special;
     const bool special = room <= NotConnected && room >= LoadShed;
     for (int i = 0; i < 27; ++i) {
         int value = 0;

@@ -22,6 +22,8 @@ bool takeDownloadRecord(InstrumentState& s, const QByteArray& record);
 
 QByteArray alarmRecord(const AlarmRecord& a, int count, bool more);
 QByteArray historyRecord(const HistoryRecord& h, int count, bool more);
+// A data log record of zeros throughout: date, time and every channel.
+QByteArray zeroHistoryRecord(int count, bool more);
 QByteArray powerRecord(const PowerRecord& p, int count, bool more);
 // What an empty log answers: "no data log" and the log's token.
 QByteArray noDataReply(const QByteArray& token);

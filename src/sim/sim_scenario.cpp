@@ -39,6 +39,60 @@ QByteArray dialResult(QString word)
     return {};
 }
 
+bool onOff(const QString& value, bool& ok)
+{
+    const QString v = value.toLower();
+    ok = v.isEmpty() || v == QLatin1String("1") || v == QLatin1String("on") || v == QLatin1String("0") || v == QLatin1String("off");
+    return v.isEmpty() || v == QLatin1String("1") || v == QLatin1String("on");
+}
+
+// "N:K" with N from first to last.
+bool pair(const QString& value, int first, int last, int& n, int& k)
+{
+    const QStringList p = value.split(QLatin1Char(':'));
+    bool ok1 = false, ok2 = false;
+    n = p.value(0).toInt(&ok1);
+    k = p.value(1).toInt(&ok2);
+    return p.size() == 2 && ok1 && ok2 && n >= first && n <= last;
+}
+
+// The keys of the odd replies; false when the key is not one of them.
+bool applyQuirk(InstrumentState& s, const QString& key, const QString& value, bool& ok)
+{
+    Quirks& q = s.quirks;
+    int n = 0, k = 0;
+    if (key == QLatin1String("zero_padded")) {
+        q.zeroPadded = onOff(value, ok);
+    } else if (key == QLatin1String("special")) {
+        n = value.toLower() == QLatin1String("off") ? 0 : value.toInt(&ok);
+        ok = ok && (n == 0 || (n <= NotConnected && n >= LoadShed));
+        if (ok)
+            q.special = n;
+    } else if (key == QLatin1String("uncounted")) {
+        n = value.toInt(&ok);
+        ok = ok && n >= 0;
+        if (ok)
+            q.uncounted = n;
+    } else if (key == QLatin1String("zero_record")) {
+        q.zeroRecord = onOff(value, ok);
+    } else if (key == QLatin1String("compressors_swapped")) {
+        q.compressorsSwapped = onOff(value, ok);
+    } else if (key == QLatin1String("torvanel_kind")) {
+        ok = pair(value, 1, 27, n, k) && k >= -1 && k <= 9;
+        if (ok)
+            q.torvanelKind[n - 1] = k;
+    } else if (key == QLatin1String("compressor_kind")) {
+        ok = pair(value, 1, 27, n, k) && k >= 0 && k <= 99;
+        if (ok) {
+            s.forceCompressorKind(n - 1, k);
+            q.wideKinds = true;
+        }
+    } else {
+        return false;
+    }
+    return true;
+}
+
 } // namespace
 
 QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
@@ -129,6 +183,7 @@ QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
             instrument.settings().brumaletDelayMs = qMax(0, n);
     } else if (key == QLatin1String("clear_faults")) {
         f = Faults();
+        instrument.state().quirks = Quirks();
     } else if (key == QLatin1String("reset")) {
         instrument.reset();
     } else if (key == QLatin1String("drop_line")) {
@@ -147,6 +202,8 @@ QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
         ok = ok && ok2 && p.size() >= 2;
         if (ok)
             instrument.state().setTorvanelAlarm(s, i, p.value(2, QStringLiteral("1")) != QLatin1String("0"));
+    } else if (applyQuirk(instrument.state(), key, value, ok)) {
+        // one of the odd replies
     } else {
         return QStringLiteral("error: unknown key '%1'").arg(key);
     }

@@ -25,13 +25,6 @@ int unitsOfKind(int kind)
     return 2;
 }
 
-bool toInt(const QByteArray& text, int& out)
-{
-    bool ok = false;
-    out = text.trimmed().toInt(&ok);
-    return ok;
-}
-
 } // namespace
 
 InstrumentState::InstrumentState(const Options& options)
@@ -532,76 +525,10 @@ bool InstrumentState::clearAlarms()
     return any;
 }
 
-bool InstrumentState::applyWrite(const QList<QByteArray>& parts)
+void InstrumentState::setCompressorKind(int row, int kind)
 {
-    int number = 0;
-    if (parts.isEmpty() || !toInt(parts[0], number))
-        return false;
-    auto orderList = [&](int field, int rows) {
-        if (parts.size() < rows + 1)
-            return false;
-        QVector<int> v(rows);
-        for (int i = 0; i < rows; ++i)
-            if (!toInt(parts[i + 1], v[i]))
-                return false;
-        for (int i = 0; i < rows; ++i)
-            m_sp[i][field] = v[i];
-        return true;
-    };
-    if (number == 65)
-        return orderList(207, 27);
-    if (number == 90)
-        return orderList(206, 12);
-    if (number == 100)
-        return orderList(95, 100);
-    // Function, channel, sub-function, width flag, value; the group size
-    // follows for all but the channel switches.
-    if (parts.size() < 5)
-        return false;
-    int wire = 0, sub = 0;
-    if (!toInt(parts[1], wire) || !toInt(parts[2], sub) || wire < 0 || wire >= Channels)
-        return false;
-    if (number == 150) {
-        m_rooms[wire].defrostLeft = 0;
-        m_rooms[wire].defrost = false;
-        m_sp[wire][44] = 0;
-        return true;
-    }
-    const Function* f = function(number);
-    if (!f || sub < 0 || sub >= f->fields.size() || f->fields[sub] < 0)
-        return false;
-    const int row = f->global ? 0 : wire;
-    if (!f->global && (wire + 1 < f->firstChannel || wire + 1 > f->lastChannel))
-        return false;
-    if (isTimeGroup(number)) {
-        int size = 0;
-        if (parts.size() < 6 || !toInt(parts[5], size) || size != f->fields.size() || parts.size() < 6 + size - 1)
-            return false;
-        QVector<int> times(size);
-        if (!toInt(parts[4], times[0]))
-            return false;
-        for (int i = 1; i < size; ++i)
-            if (!toInt(parts[5 + i], times[i]))
-                return false;
-        for (int i = 0; i < size; ++i)
-            m_sp[row][f->fields[i]] = times[i];
-        return true;
-    }
-    if (number == 49) {
-        setDescription(row, parts[4]);
-        return true;
-    }
-    int value = 0;
-    if (!toInt(parts[4], value))
-        return false;
-    if (number == 48)
-        value -= 1; // the wire names the channel, the table keeps it zero-based
-    m_sp[row][f->fields[sub]] = value;
-    if (number == 0 && sub == 5 && value == 1 && m_rooms[row].defrostLeft <= 0)
-        m_rooms[row].defrostLeft = qMax(1, m_sp[row][29]) * 60.0;
-    if (number == 23)
-        m_comp[row].units = unitsOfKind(value);
-    return true;
+    m_sp[row][165] = kind;
+    m_comp[row].units = unitsOfKind(kind);
 }
 
 } // namespace sim

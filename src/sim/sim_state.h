@@ -101,6 +101,29 @@ struct Options {
     int historyHours = 24; // plant run before start, to fill the logs
 };
 
+// Odd but possible replies, asked for by scenario lines so that tests can
+// reach them. None is on by default.
+struct Quirks {
+    // Pressure, Torvanel and evaporator replies write their numbers as a
+    // sign and zeros ("+00450", "-01000") instead of blanks and digits.
+    bool zeroPadded = false;
+    // Bank 1's pressures, the liquid level, Torvanel 1's temperatures and
+    // pressures, the first Torvanel temperature and the evaporator's coil
+    // and air temperatures read this special value (-1000 to -1004); 0 off.
+    int special = 0;
+    // The data log upload announces this many records fewer than it sends.
+    int uncounted = 0;
+    // The data log upload starts with a record that is zero throughout.
+    bool zeroRecord = false;
+    // The pressure reply carries compressors 1 and 2 in each other's place.
+    bool compressorsSwapped = false;
+    // Set by a kind forced from a scenario: a compressor kind above 9 is
+    // written whole in the narrow field of the older channel record.
+    bool wideKinds = false;
+    // The Torvanel's kind, its first further input (1 reads table B); -1 none.
+    std::array<int, 27> torvanelKind = [] { std::array<int, 27> k; k.fill(-1); return k; }();
+};
+
 // The instrument's memory and its plant. Time moves only by advance(), in
 // plant milliseconds, so that tests and the --speed option drive it alike.
 class InstrumentState {
@@ -124,12 +147,19 @@ public:
     QByteArray description(int wire) const { return m_desc[wire]; }
     void setDescription(int wire, const QByteArray& d);
 
-    // Takes a write as the "P" command carries it: the comma separated parts
+    // A write as the "P" command carries it: the comma separated parts
     // behind "P" (function, channel, sub-function, width flag, value, group
     // size, further values), or a whole order for functions 65, 90 and 100.
-    // False when the instrument has no such function for that channel or a
-    // value is not a number.
+    // acceptsWrite is false when the instrument has no such function for
+    // that channel, or a value is not a whole number, is outside the
+    // function's range or does not fit its field; applyWrite then changes
+    // nothing. Both in sim_write.cpp.
+    bool acceptsWrite(const QList<QByteArray>& parts) const;
     bool applyWrite(const QList<QByteArray>& parts);
+    // Whether a field of the table can take a value of a downloaded record:
+    // a whole number that fits the field, or for the description six
+    // characters. Ranges are the business of single writes.
+    bool fieldHolds(int field, const QByteArray& text) const;
 
     const RoomState& room(int channel) const { return m_rooms[channel - 1]; } // 1..216
     // The reading of a channel as the replies carry it: value or special.
@@ -149,6 +179,10 @@ public:
     bool torvanelAlarm(int s, int i) const;
     void setTorvanelAlarm(int s, int i, bool on);
 
+    Quirks quirks;
+    // Field 165 set as the front panel would, without the write checks.
+    void forceCompressorKind(int row, int kind) { setCompressorKind(row, kind); }
+
     Log<AlarmRecord> alarms;
     Log<HistoryRecord> history;
     Log<PowerRecord> power;
@@ -164,6 +198,7 @@ public:
     int brumaletKind(int channel) const;
 
 private:
+    void setCompressorKind(int row, int kind);
     void seed();
     void step(double seconds);
     void minuteEvents();

@@ -22,13 +22,17 @@ class Layout {
 public:
     explicit Layout(int length = 0) : m_text(length, ' ') {}
     void put(int pos, const QByteArray& text);
-    void putNum(int pos, qint64 value, int width) { put(pos, num(value, width)); }
+    void putNum(int pos, qint64 value, int width) { put(pos, number(value, width)); }
+    // Numbers as a sign and zeros from now on.
+    void setZeroPadded(bool on) { m_zeros = on; }
+    QByteArray number(qint64 value, int width) const { return m_zeros ? signedNum(value, width) : num(value, width); }
     void putFlag(int pos, bool on) { put(pos, on ? "1" : "0"); }
     int length() const { return int(m_text.size()); }
     QByteArray text() const { return m_text; }
 
 private:
     QByteArray m_text;
+    bool m_zeros = false;
 };
 
 } // namespace sim

@@ -54,6 +54,8 @@ private slots:
     void splitArrival();
     void writeEcho_data();
     void writeEcho();
+    void refusedWrite_data();
+    void refusedWrite();
     void download();
     void logChain_data();
     void logChain();
@@ -89,6 +91,12 @@ void TstSimDialogue::recogniser_data()
     QTest::newRow("key byte") << QByteArray("9.7") << QByteArray(1, char(164 + 3)) << QByteArray("tempfront");
     QTest::newRow("g key") << QByteArray("9.6") << z(41) + "g;" << QByteArray("tempfront");
     QTest::newRow("h0") << QByteArray("9.6") << z(41) + "h0" << QByteArray("tempfront");
+    QTest::newRow("g key at 8.9") << QByteArray("8.9") << z(41) + "g1" << QByteArray("tempfront");
+    QTest::newRow("h key at 9.8") << QByteArray("9.8") << z(41) + "h?" << QByteArray("tempfront");
+    QTest::newRow("g key at 9.7") << QByteArray("9.7") << z(41) + "g1" << QByteArray();
+    QTest::newRow("h key at 7") << QByteArray("7") << z(41) + "h2" << QByteArray();
+    QTest::newRow("key byte at 9.1") << QByteArray("9.1") << QByteArray(1, char(164 + 1)) << QByteArray();
+    QTest::newRow("key byte at 6.5") << QByteArray("6.5") << QByteArray(1, char(164)) << QByteArray("tempfront");
     QTest::newRow("modem text on a direct line") << QByteArray("9.6") << QByteArray("ATX4DT5551234\r\n") << QByteArray();
     QTest::newRow("after modem text") << QByteArray("9.6") << "ATH0\r\nF" + Eot << QByteArray("status");
 }
@@ -178,6 +186,50 @@ void TstSimDialogue::writeEcho()
     QCOMPARE(rig.instrument.state().field(wire, field), before);
 }
 
+void TstSimDialogue::refusedWrite_data()
+{
+    QTest::addColumn<QByteArray>("version");
+    QTest::addColumn<QByteArray>("command");
+    QTest::addColumn<bool>("taken");
+    QTest::addColumn<QByteArray>("recordHas"); // in channel 1's record once taken
+    QTest::newRow("suction pressure at its floor") << QByteArray("9.6") << QByteArray("59,0,0,1,-500,5,") << true << QByteArray("-500");
+    QTest::newRow("suction pressure below") << QByteArray("9.6") << QByteArray("59,0,0,1,-1000,5,") << false << QByteArray();
+    QTest::newRow("set temperature above") << QByteArray("9.6") << QByteArray("5,0,0,1,1501,4,") << false << QByteArray();
+    QTest::newRow("set temperature with a point") << QByteArray("9.6") << QByteArray("5,0,0,1,12.5,4,") << false << QByteArray();
+    QTest::newRow("differential too small") << QByteArray("9.6") << QByteArray("6,0,0,0,1,1,") << false << QByteArray();
+    QTest::newRow("PID full on negative") << QByteArray("14") << QByteArray("83,0,0,0,-30,1,") << true << QByteArray("   -30");
+    QTest::newRow("slow load too wide") << QByteArray("9.6") << QByteArray("57,0,0,1,1000,5,") << false << QByteArray();
+    QTest::newRow("no such function") << QByteArray("9.6") << QByteArray("27,0,0,0,1,1,") << false << QByteArray();
+    QTest::newRow("pressure alarm off a pressure channel") << QByteArray("9.6") << QByteArray("13,20,0,1,100,1,") << false << QByteArray();
+    QTest::newRow("times out of order") << QByteArray("9.6") << QByteArray("17,0,0,1,60,4,120,100,240,") << false << QByteArray();
+    QTest::newRow("time past midnight") << QByteArray("9.6") << QByteArray("17,0,0,1,60,4,120,180,1440,") << false << QByteArray();
+    QTest::newRow("description with blanks") << QByteArray("9.6") << QByteArray("49,0,0,0,A B  C,6,") << true << QByteArray("A B  C");
+    QTest::newRow("description too long") << QByteArray("9.6") << QByteArray("49,0,0,0,Freezer,6,") << false << QByteArray();
+    QTest::newRow("description too short") << QByteArray("9.6") << QByteArray("49,0,0,0,Dock,6,") << false << QByteArray();
+    QTest::newRow("compressor kind wide from 8") << QByteArray("8") << QByteArray("23,0,0,0,10,1,") << true << QByteArray("    10");
+    QTest::newRow("compressor kind wide at 7") << QByteArray("7") << QByteArray("23,0,0,0,10,1,") << false << QByteArray();
+    QTest::newRow("daily mask empty") << QByteArray("9.6") << QByteArray("041,0,3,0,0,7,") << false << QByteArray();
+}
+
+void TstSimDialogue::refusedWrite()
+{
+    QFETCH(QByteArray, version);
+    QFETCH(QByteArray, command);
+    QFETCH(bool, taken);
+    QFETCH(QByteArray, recordHas);
+    Rig rig(version);
+    const QByteArray before = rig.say(z(61) + "a0," + Eot);
+    const QByteArray echo = rig.say(z(61) + "P" + command + Eot);
+    // A write the instrument cannot hold is not echoed, and an "X" after it
+    // changes nothing.
+    QCOMPARE(echo.isEmpty(), !taken);
+    rig.say("X");
+    const QByteArray after = rig.say(z(61) + "a0," + Eot);
+    QCOMPARE(after == before, !taken);
+    if (taken)
+        QVERIFY2(after.contains(recordHas), after.constData());
+}
+
 void TstSimDialogue::download()
 {
     Rig rig;
@@ -217,6 +269,7 @@ void TstSimDialogue::logChain()
     for (int ch : {3, 9, 12})
         s.raiseAlarm(ch);
     rig.instrument.advance(3 * 3600 * 1000); // three hours of logging
+    rig.instrument.advance(1000); // "alm-new" has gone out and the line is quiet again
     const int count = letter == "D" ? int(s.alarms.records.size()) : letter == "S" ? int(s.history.records.size()) : int(s.power.records.size());
     QVERIFY(count >= 3);
     auto flag = [&](const QByteArray& r) {

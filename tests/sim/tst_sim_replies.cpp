@@ -115,6 +115,11 @@ void TstSimReplies::downloadRecord_data()
     QTest::newRow("216") << QByteArray("14") << QByteArray("215,1,0,0,360,720,1080,Dock 1,2,0,15,30,45,") << true << 215 << 94 << 45;
     QTest::newRow("216 short") << QByteArray("14") << QByteArray("215,1,0,0,360,720,1080,Dock 1,2,0,15,30,") << false << 215 << 94 << 1080;
     QTest::newRow("216 not numeric") << QByteArray("14") << QByteArray("215,1,0,0,360,720,x,Dock 1,2,0,15,30,45,") << false << 215 << 94 << 1080;
+    QTest::newRow("216 flag too wide") << QByteArray("14") << QByteArray("215,10,0,0,360,720,1080,Dock 1,2,0,15,30,45,") << false << 215 << 94 << 1080;
+    QTest::newRow("216 time too wide") << QByteArray("14") << QByteArray("215,1,0,0,360,720,-100000,Dock 1,2,0,15,30,45,") << false << 215 << 94 << 1080;
+    QTest::newRow("216 padded value") << QByteArray("14") << QByteArray("215,1,0,0,360,720, 1080,Dock 1,2,0,15,30,45,") << false << 215 << 94 << 1080;
+    QTest::newRow("216 description short") << QByteArray("14") << QByteArray("215,1,0,0,360,720,1080,Dock,2,0,15,30,45,") << false << 215 << 94 << 1080;
+    QTest::newRow("216 description long") << QByteArray("14") << QByteArray("215,1,0,0,360,720,1080,Dock 12,2,0,15,30,45,") << false << 215 << 94 << 1080;
     // A record of n values for the wire channel, the description in its
     // place, the last value 77.
     auto record = [](int wire, int n) {
