@@ -330,41 +330,41 @@ std::optional<WritePath::Write> WritePath::compose(int function, int channel, in
     return w;
 }
 
-void WritePath::gotFocus(int function, int channel, int subfunction)
+QString write_command::shownValue(InstrumentStore& store, int function, int channel, int subfunction)
 {
-    oldvalue.clear();
     if (channel < 1 || channel > catalogue::kChannels)
-        return;
+        return {};
     if (const int box = checkBoxOf(function, subfunction); box >= 0) {
         const int field = fieldOfCheckBox(function, subfunction);
-        oldvalue = field == catalogue::kNoField ? QStringLiteral("0")
-                                                : storedText(box == 40 ? 0 : channel - 1, field);
-        return;
+        return field == catalogue::kNoField
+                   ? QStringLiteral("0")
+                   : channel_record::storeText(store.setpoint(box == 40 ? 0 : channel - 1, field));
     }
     const catalogue::Function* f = catalogue::findFunction(function);
     if (!f || f->field(subfunction) == catalogue::kNoField)
-        return;
-    const write_check::Context c = checkContext(function, channel, subfunction);
-    oldvalue = write_check::screenText(*f, m_store.setpoint(f->storeRow(channel), f->field(subfunction)),
-                                       c.bankIsTemperature, c.controlType);
+        return {};
+    const write_check::Context c = checkContextOf(store, function, channel, subfunction);
+    return write_check::screenText(*f, store.setpoint(f->storeRow(channel), f->field(subfunction)),
+                                   c.bankIsTemperature, c.controlType);
 }
 
-write_check::Context WritePath::checkContext(int function, int channel, int subfunction)
+write_check::Context write_command::checkContextOf(InstrumentStore& store, int function, int channel,
+                                                   int subfunction)
 {
     write_check::Context c;
     const catalogue::Function* f = catalogue::findFunction(function);
     if (!f || channel < 1 || channel > catalogue::kChannels)
         return c;
     c.bankIsTemperature = f->unit == catalogue::Unit::KpaOrTenths
-                          && m_store.setpoint(0, kBankTypeField + subfunction).toInt() == 1;
-    c.controlType = m_store.setpoint(channel - 1, kControlTypeField).toInt();
+                          && store.setpoint(0, kBankTypeField + subfunction).toInt() == 1;
+    c.controlType = store.setpoint(channel - 1, kControlTypeField).toInt();
     if (f->unit == catalogue::Unit::TimeOfDay) {
         auto timeAt = [&](int sub) -> std::optional<int> {
             if (sub < 0 || sub >= f->group)
                 return std::nullopt;
             double v = 0;
             // A blank time reads 10:00.
-            if (!catalogue::numericValue(m_store.setpoint(f->storeRow(channel), f->field(sub)), &v))
+            if (!catalogue::numericValue(store.setpoint(f->storeRow(channel), f->field(sub)), &v))
                 return kBlankTime;
             return int(v);
         };
@@ -372,6 +372,11 @@ write_check::Context WritePath::checkContext(int function, int channel, int subf
         c.nextTime = timeAt(subfunction + 1);
     }
     return c;
+}
+
+void WritePath::gotFocus(int function, int channel, int subfunction)
+{
+    oldvalue = shownValue(m_store, function, channel, subfunction);
 }
 
 bool WritePath::writeValue(int function, int channel, int subfunction, const QString& screenText,
@@ -387,7 +392,7 @@ bool WritePath::writeValue(int function, int channel, int subfunction, const QSt
     }
     description_fault = 0;
     const write_check::Verdict verdict = write_check::check(function, channel, subfunction, screenText, oldvalue,
-                                                            checkContext(function, channel, subfunction));
+                                                            checkContextOf(m_store, function, channel, subfunction));
     if (verdict.outcome != write_check::Outcome::Accept) {
         if (error)
             *error = verdict.outcome == write_check::Outcome::Unchanged ? QString() : verdict.summary;

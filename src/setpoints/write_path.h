@@ -65,6 +65,13 @@ enum ControlKind {
     KindCondenserBank = 107,
 };
 
+// What the box of a function's sub-function on a 1-based channel shows of
+// the store: "21.5", "08:30", a list index, a check box's 0 or 1.
+QString shownValue(InstrumentStore& store, int function, int channel, int subfunction);
+// What the checks of a value need from the store (bank kind, control type,
+// the neighbouring times of a group).
+write_check::Context checkContextOf(InstrumentStore& store, int function, int channel, int subfunction);
+
 } // namespace write_command
 
 class WritePath : public QObject {
@@ -128,9 +135,6 @@ public:
     // The control of a function's sub-function on a 1-based channel takes the
     // focus: oldvalue takes what its box shows now, from the store.
     void gotFocus(int function, int channel, int subfunction);
-    // What the checks of a value need from the store (bank kind, control
-    // type, the neighbouring times of a group).
-    write_check::Context checkContext(int function, int channel, int subfunction);
     // The focus leaves the control: gate, the checks against oldvalue, the
     // store, the command, and the function's effects. False when nothing went
     // out (the reason in *error; empty when the value was unchanged); a
