@@ -35,6 +35,7 @@ private slots:
     void refusedBeforeTheLineIsOpened();
     void writesByNameAndSaysWhat();
     void functionsListsWhatSetTakes();
+    void functionNewerThanTheFirmware();
 };
 
 void TestE2ESet::refusedBeforeTheLineIsOpened_data()
@@ -115,6 +116,24 @@ void TestE2ESet::functionsListsWhatSetTakes()
     r = ctl(data.path(), {}, {"--json", "functions"});
     const QJsonArray rows = QJsonDocument::fromJson(r.out.toUtf8()).array();
     QVERIFY(rows.size() > 70);
+}
+
+void TestE2ESet::functionNewerThanTheFirmware()
+{
+    QProcess sim;
+    sim.start(QStringLiteral(Q19SIM_PATH), {"--pty", "--id", "1", "--version", "13"});
+    QVERIFY(sim.waitForStarted(5000));
+    for (int i = 0; i < 50 && !sim.canReadLine(); ++i)
+        sim.waitForReadyRead(100);
+    const QString port = QString::fromLocal8Bit(sim.readLine()).trimmed();
+    QTemporaryDir data;
+    const Run r = ctl(data.path(), port, {"set", "PID Differential", "1", "0", "1.5"});
+    QCOMPARE(r.exitCode, 1);
+    QVERIFY2(r.err.contains("PID Differential needs firmware 14 or later; the instrument has 13: nothing sent"),
+             qPrintable(r.err));
+    QVERIFY(r.out.isEmpty());
+    sim.kill();
+    sim.waitForFinished(2000);
 }
 
 QTEST_GUILESS_MAIN(TestE2ESet)
