@@ -1,5 +1,5 @@
-// q19ctl setpoints upload|download|diff, q19ctl set and q19ctl audit: the
-// transfers of the channels view and the checked write, without windows.
+// q19ctl setpoints upload|download|diff and q19ctl audit: the transfers of
+// the channels view without windows, and the record of the writes.
 
 #include "ctl/ctl_command.h"
 #include "ctl/ctl_connect.h"
@@ -323,61 +323,6 @@ int setpoints(const CtlOptions& given)
     return ok ? ctl::Ok : ctl::Failure;
 }
 
-int set(const CtlOptions& o)
-{
-    if (o.args.size() != 4) {
-        err(QStringLiteral("usage: set FUNCTION CHANNEL SUBFUNCTION VALUE"));
-        return ctl::Usage;
-    }
-    bool ok1 = false, ok2 = false, ok3 = false;
-    const int function = o.args[0].toInt(&ok1);
-    const int channel = o.args[1].toInt(&ok2);
-    const int sub = o.args[2].toInt(&ok3);
-    if (!ok1 || !ok2 || !ok3 || channel < 1 || channel > catalogue::kChannels) {
-        err(QStringLiteral("FUNCTION, CHANNEL (1-216) and SUBFUNCTION are numbers"));
-        return ctl::Usage;
-    }
-    instrumentId(o, nullptr);
-    Session s(o);
-    if (const int rc = s.open(QStringLiteral("set")))
-        return rc;
-    WritePath& w = s.channels().writer;
-    QString error;
-    const std::optional<WritePath::Write> composed = w.compose(function, channel, sub, o.args[3], &error);
-    w.description_fault = 0;
-    if (!composed) {
-        err(error);
-        return ctl::Usage;
-    }
-    if (const catalogue::Function* f = catalogue::findFunction(function);
-        f && f->rangeChecked && f->unit != catalogue::Unit::Text && !composed->fields.isEmpty()) {
-        const bool bankTemp = s.store().setpoint(0, 218 + sub).toInt() == 1;
-        const int controlType = s.store().setpoint(channel - 1, 209).toInt();
-        const qint64 v = composed->fields.first().second.toLongLong();
-        if (!catalogue::inRange(*f, v, bankTemp, controlType)) {
-            const catalogue::Range r = catalogue::rangeOf(*f, bankTemp, controlType);
-            err(QStringLiteral("%1 is outside %2 to %3 (store units)").arg(v).arg(r.min).arg(r.max));
-            return ctl::Usage;
-        }
-    }
-    int result = -1;
-    QObject::connect(&w, &WritePath::confirmed, &w, [&] { result = ctl::Ok; });
-    QObject::connect(&w, &WritePath::abandoned, &w, [&] { result = ctl::Failure; });
-    if (!w.writeValue(function, channel, sub, o.args[3], &error)) {
-        if (error.isEmpty()) {
-            ctl::progress(QStringLiteral("The value is already %1: nothing sent").arg(o.args[3]));
-            return ctl::Ok;
-        }
-        err(error);
-        return ctl::Failure;
-    }
-    ctl::progress(QStringLiteral("Sent %1, waiting for the echo").arg(QString::fromLatin1(composed->body)));
-    s.waitFor([&] { return result >= 0; });
-    if (result == ctl::Ok)
-        out(QStringLiteral("confirmed: %1\n").arg(w.sent_to_glacinor));
-    return result;
-}
-
 int audit(const CtlOptions& o)
 {
     if (!o.args.isEmpty()) {
@@ -427,10 +372,6 @@ const ctl::Registration setpointsCommand(
      QStringLiteral("upload the set points into the store, download the store into the instrument (channels "
                     "never uploaded or edited only with --force), or list what a download would change"),
      setpoints});
-const ctl::Registration setCommand({QStringLiteral("set"), QStringLiteral("FUNCTION CHANNEL SUBFUNCTION VALUE"),
-                                    QStringLiteral("write one set point (screen units) to the store and the "
-                                                   "instrument, checked by its echo"),
-                                    set});
 const ctl::Registration auditCommand({QStringLiteral("audit"), QString(),
                                       QStringLiteral("list the writes sent to the instrument and their outcome"),
                                       audit});

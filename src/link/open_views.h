@@ -56,6 +56,8 @@ public:
 class TemperatureStatusView : public StatusCycleView {
 public:
     virtual void status_do() = 0;
+    // The channels of each bank were written: read them again and show them.
+    virtual void redoBanks() {}
 };
 // frmstatusp: "presss" and "torvan".
 class PressureStatusView : public StatusCycleView {

@@ -253,6 +253,38 @@ const Function* findFunction(int number)
     return nullptr;
 }
 
+namespace {
+
+QString nameKey(const QString& name)
+{
+    QString key;
+    for (QChar c : name)
+        if (c.isLetterOrNumber())
+            key += c.toLower();
+    return key;
+}
+
+} // namespace
+
+const Function* findFunctionByName(const QString& name)
+{
+    const QString key = nameKey(name);
+    if (key.isEmpty())
+        return nullptr;
+    const Function* begins = nullptr;
+    int beginning = 0;
+    for (const Function& f : kFunctions) {
+        const QString k = nameKey(QString::fromLatin1(f.name));
+        if (k == key)
+            return &f;
+        if (k.startsWith(key)) {
+            begins = &f;
+            ++beginning;
+        }
+    }
+    return beginning == 1 ? begins : nullptr;
+}
+
 FieldOwner findField(int field)
 {
     FieldOwner owner;

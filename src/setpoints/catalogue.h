@@ -141,6 +141,10 @@ std::span<const int> globalFunctions();
 
 // Lookups. Null when there is no such thing.
 const Function* findFunction(int number);
+// By name, as a person types it: case, blanks and punctuation do not count
+// ("set differential" is "Set Differential", "diff'tial type" is function 7);
+// a beginning that fits one name alone will do. Null when none or several fit.
+const Function* findFunctionByName(const QString& name);
 // The tagged function that owns a store field, with the sub-function.
 struct FieldOwner {
     const Function* function = nullptr;   // tagged owner, if any

@@ -89,6 +89,10 @@ constexpr int kEchoWaitMs = 1000;
 constexpr int kPidControlType = 7;
 constexpr int kBankTypeField = 218;   // function 82, by bank
 constexpr int kControlTypeField = 209; // function 112
+constexpr int kBlankTime = 600;
+constexpr int kChannelsInBank = 1;
+constexpr int kCompressorsInBank = 22;
+constexpr int kCondensersInBank = 25;
 
 int fieldOfCheckBox(int function, int subfunction)
 {
@@ -326,6 +330,55 @@ std::optional<WritePath::Write> WritePath::compose(int function, int channel, in
     return w;
 }
 
+QString write_command::shownValue(InstrumentStore& store, int function, int channel, int subfunction)
+{
+    if (channel < 1 || channel > catalogue::kChannels)
+        return {};
+    if (const int box = checkBoxOf(function, subfunction); box >= 0) {
+        const int field = fieldOfCheckBox(function, subfunction);
+        return field == catalogue::kNoField
+                   ? QStringLiteral("0")
+                   : channel_record::storeText(store.setpoint(box == 40 ? 0 : channel - 1, field));
+    }
+    const catalogue::Function* f = catalogue::findFunction(function);
+    if (!f || f->field(subfunction) == catalogue::kNoField)
+        return {};
+    const write_check::Context c = checkContextOf(store, function, channel, subfunction);
+    return write_check::screenText(*f, store.setpoint(f->storeRow(channel), f->field(subfunction)),
+                                   c.bankIsTemperature, c.controlType);
+}
+
+write_check::Context write_command::checkContextOf(InstrumentStore& store, int function, int channel,
+                                                   int subfunction)
+{
+    write_check::Context c;
+    const catalogue::Function* f = catalogue::findFunction(function);
+    if (!f || channel < 1 || channel > catalogue::kChannels)
+        return c;
+    c.bankIsTemperature = f->unit == catalogue::Unit::KpaOrTenths
+                          && store.setpoint(0, kBankTypeField + subfunction).toInt() == 1;
+    c.controlType = store.setpoint(channel - 1, kControlTypeField).toInt();
+    if (f->unit == catalogue::Unit::TimeOfDay) {
+        auto timeAt = [&](int sub) -> std::optional<int> {
+            if (sub < 0 || sub >= f->group)
+                return std::nullopt;
+            double v = 0;
+            // A blank time reads 10:00.
+            if (!catalogue::numericValue(store.setpoint(f->storeRow(channel), f->field(sub)), &v))
+                return kBlankTime;
+            return int(v);
+        };
+        c.previousTime = timeAt(subfunction - 1);
+        c.nextTime = timeAt(subfunction + 1);
+    }
+    return c;
+}
+
+void WritePath::gotFocus(int function, int channel, int subfunction)
+{
+    oldvalue = shownValue(m_store, function, channel, subfunction);
+}
+
 bool WritePath::writeValue(int function, int channel, int subfunction, const QString& screenText,
                            QString* error)
 {
@@ -338,29 +391,47 @@ bool WritePath::writeValue(int function, int channel, int subfunction, const QSt
         return false;
     }
     description_fault = 0;
+    const write_check::Verdict verdict = write_check::check(function, channel, subfunction, screenText, oldvalue,
+                                                            checkContextOf(m_store, function, channel, subfunction));
+    if (verdict.outcome != write_check::Outcome::Accept) {
+        if (error)
+            *error = verdict.outcome == write_check::Outcome::Unchanged ? QString() : verdict.summary;
+        if (verdict.outcome == write_check::Outcome::Refused)
+            m_op.ask(verdict.message);
+        return false;
+    }
     QString why;
     const std::optional<Write> w = compose(function, channel, subfunction, screenText, &why);
-    if (error)
-        *error = why;
     if (!w) {
         description_fault = 0;
-        if (why.startsWith(QStringLiteral("Not a valid number")))
-            m_op.message(QStringLiteral("Invalid Value"),
-                         {QStringLiteral("Not a valid number, Enter a valid number"),
-                          QStringLiteral("The old value will be used.")},
-                         Operator::Icon::Exclamation);
+        if (error)
+            *error = why;
         return false;
     }
-    bool same = !w->fields.isEmpty();
-    for (const auto& [field, value] : w->fields)
-        same = same && storedText(w->storeRow, field) == channel_record::storeText(value);
-    if (same) {
-        description_fault = 0;
-        return false;
-    }
-    oldvalue = w->oldValue;
     send(*w);
+    effects(function);
     return true;
+}
+
+void WritePath::effects(int function)
+{
+    // The order places follow the banks' counts: a new count makes the old
+    // order meaningless, so the natural order stands until the operator
+    // picks a new one.
+    if (function == kCompressorsInBank)
+        resetOrder(catalogue::kCompressorOrderField, catalogue::lastChannel(catalogue::Scope::Compressor));
+    else if (function == kCondensersInBank)
+        resetOrder(catalogue::kCondenserOrderField, catalogue::lastChannel(catalogue::Scope::Condenser));
+    else if (function == kChannelsInBank && m_views.status_open && m_views.status)
+        m_views.status->redoBanks();
+}
+
+void WritePath::resetOrder(int field, int places)
+{
+    Store::Transaction tx(m_store.store());
+    for (int row = 0; row < places; ++row)
+        m_store.setSetpoint(row, field, row + 1);
+    tx.commit();
 }
 
 void WritePath::ret_handel()
@@ -373,6 +444,8 @@ void WritePath::ret_handel()
             m_audit->setOutcome(m_auditEntry, QStringLiteral("X"));
         m_auditEntry = -1;
         emit confirmed(write_control_kind, write_control_index);
+        if (write_control_kind == KindCompressorBank || write_control_kind == KindCondenserBank)
+            orderResetMessage(write_control_kind == KindCompressorBank);
         Timer1.stop();
     } else {
         // The failure path follows shortly.
@@ -396,6 +469,15 @@ void WritePath::ret_handel()
     }
     description_fault = 0;
     emit changed();
+}
+
+void WritePath::orderResetMessage(bool compressors)
+{
+    const QString what = compressors ? QStringLiteral("compressor") : QStringLiteral("condenser");
+    m_op.message(compressors ? QStringLiteral("Compressor Reset") : QStringLiteral("Condenser Reset"),
+                 {QStringLiteral("The %1 order of all banks have been reset,").arg(what),
+                  QStringLiteral("Re do %1 order for required banks,").arg(what),
+                  QStringLiteral("and update to the Glacinor when finished.")});
 }
 
 void WritePath::noEcho(Timer& timer)

@@ -10,6 +10,7 @@
 #include "link/commands.h"
 #include "platform/clock.h"
 #include "platform/operator.h"
+#include "setpoints/write_check.h"
 
 #include <QByteArray>
 #include <QList>
@@ -63,6 +64,13 @@ enum ControlKind {
     KindCondUpdate = 106,
     KindCondenserBank = 107,
 };
+
+// What the box of a function's sub-function on a 1-based channel shows of
+// the store: "21.5", "08:30", a list index, a check box's 0 or 1.
+QString shownValue(InstrumentStore& store, int function, int channel, int subfunction);
+// What the checks of a value need from the store (bank kind, control type,
+// the neighbouring times of a group).
+write_check::Context checkContextOf(InstrumentStore& store, int function, int channel, int subfunction);
 
 } // namespace write_command
 
@@ -124,8 +132,13 @@ public:
     // when the text is no number or the channel has no such function.
     std::optional<Write> compose(int function, int channel, int subfunction, const QString& screenText,
                                  QString* error = nullptr);
-    // Gate, compose, compare with the stored value, send. False when nothing
-    // went out (the reason in *error; empty when the value was unchanged).
+    // The control of a function's sub-function on a 1-based channel takes the
+    // focus: oldvalue takes what its box shows now, from the store.
+    void gotFocus(int function, int channel, int subfunction);
+    // The focus leaves the control: gate, the checks against oldvalue, the
+    // store, the command, and the function's effects. False when nothing went
+    // out (the reason in *error; empty when the value was unchanged); a
+    // refusal shows the program's message.
     bool writeValue(int function, int channel, int subfunction, const QString& screenText,
                     QString* error = nullptr);
 
@@ -141,6 +154,9 @@ signals:
 
 private:
     void noEcho(Timer& timer);
+    void effects(int function);
+    void resetOrder(int field, int places);
+    void orderResetMessage(bool compressors);
     QString storedText(int row, int field);
 
     Link& m_link;

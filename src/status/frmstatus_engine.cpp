@@ -180,6 +180,16 @@ void frmstatus_engine::show_channel_rows()
     chanBanks();
 }
 
+void frmstatus_engine::redoBanks()
+{
+    if (!m_store)
+        return;
+    for (int b = 0; b < kBanks; ++b)
+        m_bankSize[b] = number(m_store->setpoint(0, kBankSizeFirstField + b));
+    chanBanks();
+    emit changed();
+}
+
 void frmstatus_engine::chanBanks()
 {
     const int* b = m_bankSize;

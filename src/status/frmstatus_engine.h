@@ -67,6 +67,7 @@ public:
     void status_do() override;
     bool stopstatusEnabled() const override { return cycle.runningForOthers(); }
     void stopstatus_Click() override { cycle.stopstatus_Click(); }
+    void redoBanks() override;
 
     // --- procedures ---
     void status_do(const QString& reply);

@@ -60,6 +60,8 @@ private slots:
     void screenForms_data();
     void screenForms();
     void defaultsLieInTheirRange();
+    void functionsByName_data();
+    void functionsByName();
 };
 
 void TestCatalogue::functionMatchesItsRow_data()
@@ -515,6 +517,29 @@ void TestCatalogue::defaultsLieInTheirRange()
         QVERIFY2(!f.rangeChecked || (f.defaultValue >= f.min && f.defaultValue <= f.max), f.name);
     QCOMPARE(parseTenths(QStringLiteral("-.")), std::nullopt);
     QCOMPARE(parseTenths(QStringLiteral(" 2.25")), std::optional<qint64>(23));
+}
+
+void TestCatalogue::functionsByName_data()
+{
+    QTest::addColumn<QString>("typed");
+    QTest::addColumn<int>("function"); // -1: none
+    QTest::newRow("as shown") << "Set Differential" << 6;
+    QTest::newRow("case and blanks") << "set  differential" << 6;
+    QTest::newRow("punctuation left out") << "difftial type" << 7;
+    QTest::newRow("doubled blank inside") << "Low Alarm KPA" << 14;
+    QTest::newRow("beginning of one name") << "set temp" << 5;
+    QTest::newRow("beginning of several") << "comp" << -1;
+    QTest::newRow("whole name") << "Cond Load Time" << 88;
+    QTest::newRow("no letters") << "'-" << -1;
+    QTest::newRow("none") << "defrost now" << -1;
+}
+
+void TestCatalogue::functionsByName()
+{
+    QFETCH(QString, typed);
+    QFETCH(int, function);
+    const catalogue::Function* f = catalogue::findFunctionByName(typed);
+    QCOMPARE(f ? f->number : -1, function);
 }
 
 QTEST_GUILESS_MAIN(TestCatalogue)

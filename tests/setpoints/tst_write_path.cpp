@@ -15,6 +15,8 @@ class FakeStatusView : public TemperatureStatusView {
 public:
     bool running = true;
     int stops = 0;
+    int bankRedos = 0;
+    void redoBanks() override { ++bankRedos; }
     bool stopstatusEnabled() const override { return running; }
     void stopstatus_Click() override
     {
@@ -38,8 +40,14 @@ private slots:
     void noEchoBreaksOffAfterTheKindsTimer_data();
     void noEchoBreaksOffAfterTheKindsTimer();
     void lineDownStoresOnly();
-    void sameValueSendsNothing();
-    void notANumberKeepsTheOldValue();
+    void comparedWithTheBoxBeforeTheEdit_data();
+    void comparedWithTheBoxBeforeTheEdit();
+    void refusedValuesKeepTheStore_data();
+    void refusedValuesKeepTheStore();
+    void newBankCountsResetTheOrder_data();
+    void newBankCountsResetTheOrder();
+    void channelsInBankRedoTheStatusBanks_data();
+    void channelsInBankRedoTheStatusBanks();
     void oneShotFlagsSwallowOneWrite_data();
     void oneShotFlagsSwallowOneWrite();
     void runningStatusIsStoppedFirst_data();
@@ -271,23 +279,187 @@ void TestWritePath::lineDownStoresOnly()
     QVERIFY(m_audit->entries().isEmpty());
 }
 
-void TestWritePath::sameValueSendsNothing()
+void TestWritePath::comparedWithTheBoxBeforeTheEdit_data()
 {
-    m_inst->store->setSetpoint(2, 53, 77);
-    QString error;
-    QVERIFY(!m_path->writeValue(47, 3, 0, QStringLiteral("77"), &error));
-    QVERIFY(error.isEmpty());
-    QVERIFY(m_link->out.isEmpty());
+    QTest::addColumn<int>("function");
+    QTest::addColumn<int>("channel");
+    QTest::addColumn<int>("sub");
+    QTest::addColumn<QList<int>>("before"); // row, field, value: the store when the box got the focus
+    QTest::addColumn<QList<int>>("during"); // stored while the box had it (up-down, check box)
+    QTest::addColumn<QString>("typed");
+    QTest::addColumn<bool>("sent");
+    QTest::newRow("same number") << 47 << 3 << 0 << QList<int>{2, 53, 77} << QList<int>{} << "77" << false;
+    QTest::newRow("same decimal written longer") << 5 << 3 << 0 << QList<int>{2, 2, 215} << QList<int>{} << "21.50"
+                                                 << false;
+    QTest::newRow("time stored by the up-down") << 17 << 2 << 1 << QList<int>{1, 6, 300, 1, 7, 360, 1, 8, 600}
+                                                << QList<int>{1, 7, 510} << "08:30" << true;
+    QTest::newRow("time back where it was") << 17 << 2 << 1 << QList<int>{1, 6, 300, 1, 7, 360, 1, 8, 600}
+                                            << QList<int>{1, 7, 510, 1, 7, 360} << "06:00" << false;
+    QTest::newRow("check box stored on click") << 0 << 13 << 3 << QList<int>{12, 49, 0} << QList<int>{12, 49, 1}
+                                               << "1" << true;
+    QTest::newRow("global from another channel") << 86 << 40 << 0 << QList<int>{0, 83, 2} << QList<int>{} << "2"
+                                                 << false;
 }
 
-void TestWritePath::notANumberKeepsTheOldValue()
+void TestWritePath::comparedWithTheBoxBeforeTheEdit()
 {
-    m_inst->store->setSetpoint(2, 53, 77);
-    QVERIFY(!m_path->writeValue(47, 3, 0, QStringLiteral("7x")));
+    QFETCH(int, function);
+    QFETCH(int, channel);
+    QFETCH(int, sub);
+    QFETCH(QList<int>, before);
+    QFETCH(QList<int>, during);
+    QFETCH(QString, typed);
+    QFETCH(bool, sent);
+    for (int i = 0; i + 2 < before.size(); i += 3)
+        QVERIFY(m_inst->store->setSetpoint(before[i], before[i + 1], before[i + 2]));
+    m_path->gotFocus(function, channel, sub);
+    for (int i = 0; i + 2 < during.size(); i += 3)
+        QVERIFY(m_inst->store->setSetpoint(during[i], during[i + 1], during[i + 2]));
+    QString error;
+    QCOMPARE(m_path->writeValue(function, channel, sub, typed, &error), sent);
+    QCOMPARE(m_link->out.size(), sent ? 1 : 0);
+    QVERIFY2(error.isEmpty(), qPrintable(error));
+    QVERIFY(m_op->messages().isEmpty());
+}
+
+void TestWritePath::refusedValuesKeepTheStore_data()
+{
+    QTest::addColumn<int>("function");
+    QTest::addColumn<int>("channel");
+    QTest::addColumn<int>("sub");
+    QTest::addColumn<QList<int>>("setup"); // row, field, value; the first triple is the value edited
+    QTest::addColumn<QString>("typed");
+    QTest::addColumn<QString>("message"); // "Title: line / line", empty for none
+
+    const QString notNumber = "Invalid Value: Not a valid number, Enter a valid number / The old value will be used.";
+    const QString pressureOnly = "Invalid Channel No.: No change was made to set points / Must only use channel "
+                                 "(pressure channels) numbers 1 to 15 inclusive,";
+    QTest::newRow("decimal for a whole number") << 13 << 1 << 0 << QList<int>{0, 202, 2000} << "12.5" << notNumber;
+    QTest::newRow("letters") << 47 << 3 << 0 << QList<int>{2, 53, 77} << "7x" << notNumber;
+    QTest::newRow("two decimal places") << 5 << 1 << 0 << QList<int>{0, 2, 30} << "21.55" << notNumber;
+    QTest::newRow("above the KPA range") << 13 << 1 << 0 << QList<int>{0, 202, 2000} << "4001"
+                                         << "Invalid Value: Value Out of Range, / Enter a Value Between -100 and 4000";
+    QTest::newRow("below the degrees range") << 5 << 1 << 0 << QList<int>{0, 2, 30} << "-50.1"
+                                             << "Invalid Value: Value Out of Range, / Enter a Value Between -50.0 and 150.0";
+    QTest::newRow("super heat range") << 113 << 8 << 0 << QList<int>{7, 210, 50, 7, 209, 7} << "20.1"
+                                      << "Invalid Value: Value Out of Range, / Enter a Value Between 1.0 and 20.0";
+    QTest::newRow("not a pressure channel") << 13 << 20 << 0 << QList<int>{19, 202, 2000} << "100" << pressureOnly;
+    QTest::newRow("last pressure channel") << 16 << 16 << 0 << QList<int>{15, 205, 10} << "5"
+                                           << "Invalid Channel No.: No change was made to set points / Must only use "
+                                              "channel (pressure channels) numbers 1 to 15 inclusive,";
+    QTest::newRow("not a compressor") << 70 << 28 << 0 << QList<int>{27, 167, 0} << "5"
+                                      << "Invalid Channel No.: No change was made to set points / Must only use "
+                                         "channel (compressor) numbers 1 to 27 inclusive,";
+    QTest::newRow("not a condenser") << 91 << 13 << 0 << QList<int>{12, 169, 0} << "2"
+                                     << "Invalid Channel No.: No change was made to set points / Must only use "
+                                        "channel (condenser) numbers 1 to 12 inclusive,";
+    // The channel's class is told only for a value that would otherwise go.
+    QTest::newRow("class after the number") << 13 << 20 << 0 << QList<int>{19, 202, 2000} << "12.5" << notNumber;
+    QTest::newRow("class after the range") << 13 << 20 << 0 << QList<int>{19, 202, 2000} << "5000"
+                                           << "Invalid Value: Value Out of Range, / Enter a Value Between -100 and 4000";
+    QTest::newRow("class after the same value") << 13 << 20 << 0 << QList<int>{19, 202, 100} << "100" << "";
+    QTest::newRow("time before the previous") << 17 << 2 << 1 << QList<int>{1, 7, 400, 1, 6, 360, 1, 8, 600}
+                                              << "05:59"
+                                              << "Invalid Value: Value Out of Range, / Enter a Value Between 06:00 and 10:00";
+    QTest::newRow("time after the next") << 19 << 1 << 0 << QList<int>{0, 35, 60, 0, 36, 120} << "02:01"
+                                         << "Invalid Value: Value Out of Range, / Enter a Value Between 00:00 and 02:00";
+    QTest::newRow("no set point on a day") << 41 << 13 << 2 << QList<int>{12, 56, 4} << "0"
+                                           << "Invalid Selection: Must Select, / at Least one Set Point";
+    QTest::newRow("flag other than 0 or 1") << 0 << 13 << 3 << QList<int>{12, 49, 0} << "2"
+                                            << "Invalid Value: Value Out of Range, / Enter a Value Between 0 and 1";
+    QTest::newRow("comma in a description") << 49 << 13 << 0 << QList<int>{} << "Dock,4"
+                                            << "Invalid Character: Not a valid entry, / You cannot use the \",\" "
+                                               "character or the ENTER key";
+}
+
+void TestWritePath::refusedValuesKeepTheStore()
+{
+    QFETCH(int, function);
+    QFETCH(int, channel);
+    QFETCH(int, sub);
+    QFETCH(QList<int>, setup);
+    QFETCH(QString, typed);
+    QFETCH(QString, message);
+    for (int i = 0; i + 2 < setup.size(); i += 3)
+        QVERIFY(m_inst->store->setSetpoint(setup[i], setup[i + 1], setup[i + 2]));
+    m_path->gotFocus(function, channel, sub);
+    QVERIFY(!m_path->writeValue(function, channel, sub, typed));
     QVERIFY(m_link->out.isEmpty());
-    QCOMPARE(m_op->last().title, QStringLiteral("Invalid Value"));
-    QCOMPARE(m_op->last().lines, (QStringList{"Not a valid number, Enter a valid number", "The old value will be used."}));
-    QCOMPARE(m_inst->store->setpoint(2, 53).toInt(), 77);
+    QVERIFY(!m_path->update_pending);
+    QCOMPARE(m_op->messages().size(), message.isEmpty() ? 0 : 1);
+    if (!message.isEmpty())
+        QCOMPARE(m_op->last().toText(), message);
+    if (!setup.isEmpty())
+        QCOMPARE(m_inst->store->setpoint(setup[0], setup[1]).toInt(), setup[2]);
+}
+
+void TestWritePath::newBankCountsResetTheOrder_data()
+{
+    QTest::addColumn<int>("function");
+    QTest::addColumn<int>("field");
+    QTest::addColumn<int>("places");
+    QTest::addColumn<bool>("online");
+    QTest::addColumn<QString>("title");
+    QTest::newRow("compressors") << 22 << 207 << 27 << true << "Compressor Reset";
+    QTest::newRow("condensers") << 25 << 206 << 12 << true << "Condenser Reset";
+    QTest::newRow("compressors off line") << 22 << 207 << 27 << false << "";
+    QTest::newRow("condensers off line") << 25 << 206 << 12 << false << "";
+}
+
+void TestWritePath::newBankCountsResetTheOrder()
+{
+    QFETCH(int, function);
+    QFETCH(int, field);
+    QFETCH(int, places);
+    QFETCH(bool, online);
+    QFETCH(QString, title);
+    m_link->g.link_up = online;
+    // An order picked for the old counts, and a place behind the last that is not the order's.
+    for (int row = 0; row <= places; ++row)
+        QVERIFY(m_inst->store->setSetpoint(row, field, places - row));
+    QVERIFY(m_path->writeValue(function, 1, 1, QStringLiteral("2")));
+    for (int row = 0; row < places; ++row)
+        QCOMPARE(m_inst->store->setpoint(row, field).toInt(), row + 1);
+    QCOMPARE(m_inst->store->setpoint(places, field).toInt(), 0);
+    // The message waits for the instrument's word.
+    QVERIFY(m_op->messages().isEmpty());
+    if (!online)
+        return;
+    m_link->buffer = QStringLiteral("%1,0,1,0,2,5,sret").arg(function);
+    m_path->ret_handel();
+    QCOMPARE(m_link->out.last(), QByteArray("X"));
+    QCOMPARE(m_op->titles(), QStringList{title});
+    const QString what = function == 22 ? "compressor" : "condenser";
+    QCOMPARE(m_op->last().lines, (QStringList{QStringLiteral("The %1 order of all banks have been reset,").arg(what),
+                                              QStringLiteral("Re do %1 order for required banks,").arg(what),
+                                              "and update to the Glacinor when finished."}));
+}
+
+void TestWritePath::channelsInBankRedoTheStatusBanks_data()
+{
+    QTest::addColumn<int>("function");
+    QTest::addColumn<bool>("statusOpen");
+    QTest::addColumn<bool>("online");
+    QTest::addColumn<int>("redos");
+    QTest::newRow("channels in bank") << 1 << true << true << 1;
+    QTest::newRow("channels in bank off line") << 1 << true << false << 1;
+    QTest::newRow("status view closed") << 1 << false << true << 0;
+    QTest::newRow("compressors in bank") << 22 << true << true << 0;
+}
+
+void TestWritePath::channelsInBankRedoTheStatusBanks()
+{
+    QFETCH(int, function);
+    QFETCH(bool, statusOpen);
+    QFETCH(bool, online);
+    QFETCH(int, redos);
+    m_link->g.link_up = online;
+    FakeStatusView status;
+    status.running = false;
+    m_views->status = &status;
+    m_views->status_open = statusOpen;
+    QVERIFY(m_path->writeValue(function, 1, 2, QStringLiteral("7")));
+    QCOMPARE(status.bankRedos, redos);
 }
 
 void TestWritePath::oneShotFlagsSwallowOneWrite_data()

@@ -50,6 +50,7 @@ private slots:
     void torvanelRequestFromVersion8();
     void torvanelAlarmWords();
     void dbaseFailure();
+    void banksFollowANewCountOfChannels();
 };
 
 void tst_status_engines::statusRows()
@@ -288,6 +289,24 @@ void tst_status_engines::dbaseFailure()
     QCOMPARE(r.op.last().title, QStringLiteral("Data Base Invalid"));
     QCOMPARE(r.link.dbaseErrors, 1);
     QVERIFY(r.link.writes.isEmpty());
+}
+
+void tst_status_engines::banksFollowANewCountOfChannels()
+{
+    Rig r;
+    r.select({3, 6});
+    for (int b = 0; b < 5; ++b)
+        r.store->setSetpoint(0, 78 + b, b == 0 ? 5 : 0);
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    QCOMPARE(e.bank[0].text, QStringLiteral("Bank 1"));
+    QCOMPARE(e.bank[1].text, QStringLiteral("None"));
+    // Another form writes the counts of channels in banks 1 and 2.
+    r.store->setSetpoint(0, 78, 2);
+    r.store->setSetpoint(0, 79, 4);
+    e.redoBanks();
+    QCOMPARE(e.bank[0].text, QStringLiteral("Bank 2"));
+    QCOMPARE(e.bank[1].text, QStringLiteral("Bank 2"));
 }
 
 QTEST_GUILESS_MAIN(tst_status_engines)
