@@ -45,6 +45,7 @@ private slots:
     void ctl_data();
     void ctl();
     void ctlTakesTheSelectedInstrument();
+    void ctlKeepsQtWarningsOffTheTerminal();
     void sim_data();
     void sim();
 
@@ -149,6 +150,45 @@ void TestCommandLines::ctlTakesTheSelectedInstrument()
     const Run r = run(ctl, {"--data-dir", folder.path(), "--tcp", "127.0.0.1:" + port, "identify", "--json"});
     QVERIFY2(r.out.contains("\"id\":\"3\""), qPrintable(r.out + r.err));
     QCOMPARE(r.exitCode, 0);
+}
+
+// The instrument goes away in the middle of an upload: the user reads the
+// program's message, not the socket's complaints about reading a closed line.
+void TestCommandLines::ctlKeepsQtWarningsOffTheTerminal()
+{
+    QTemporaryDir folder;
+    QFile scenario(folder.filePath(QStringLiteral("slow.txt")));
+    QVERIFY(scenario.open(QIODevice::WriteOnly));
+    scenario.write("delay = 20\n");
+    scenario.close();
+    const QString port = closedPort();
+    QProcess sim;
+    sim.start(QStringLiteral(Q19SIM_PATH), {"--tcp", port, "--scenario", scenario.fileName()});
+    QVERIFY(sim.waitForStarted(5000));
+    QVERIFY(sim.waitForReadyRead(5000));
+
+    QProcess ctl;
+    const auto end = qScopeGuard([&] {
+        sim.kill();
+        sim.waitForFinished(2000);
+        ctl.kill();
+        ctl.waitForFinished(2000);
+    });
+    ctl.start(QStringLiteral(Q19CTL_PATH),
+              {"--data-dir", folder.path(), "--tcp", "127.0.0.1:" + port, "setpoints", "upload", "--all"});
+    QVERIFY(ctl.waitForStarted(5000));
+    QByteArray err;
+    while (!err.contains("Channel 3 of 216") && ctl.state() == QProcess::Running) {
+        ctl.waitForReadyRead(1000);
+        err += ctl.readAllStandardError();
+    }
+    QVERIFY2(err.contains("Channel 3 of 216"), err.constData());
+    sim.kill();
+    QVERIFY(ctl.waitForFinished(120000));
+    err += ctl.readAllStandardError();
+    QCOMPARE(ctl.exitCode(), 1);
+    QVERIFY2(err.contains("Comunications Failed"), err.constData());
+    QVERIFY2(!err.contains("QIODevice") && !err.contains("QAbstractSocket"), err.constData());
 }
 
 void TestCommandLines::sim_data()
