@@ -16,13 +16,11 @@ namespace {
 
 const QString Usage = QStringLiteral(
     "list | add ID NAME [--address TEXT] [--town TEXT] [--phone TEXT] [--modem-phone TEXT]"
-    " | delete ID [--yes] | compact ID");
+    " | delete ID | compact ID");
 
 int usage(const QString& why)
 {
-    std::fprintf(stderr, "q19ctl directory: %s\nUsage: q19ctl directory %s\n", why.toLocal8Bit().constData(),
-                 Usage.toLocal8Bit().constData());
-    return ctl::Usage;
+    return ctl::usageError(QStringLiteral("directory"), why);
 }
 
 void out(const QString& text)
@@ -52,35 +50,20 @@ int list(ccForm1_directory& form, bool json)
     return ctl::Ok;
 }
 
-int add(ccForm1_directory& form, QStringList args)
+// The boxes that add fills from the command's own options.
+const QList<QPair<QString, int>> kBoxOptions = {
+    {QStringLiteral("address"), ccForm1_directory::AddressBox},
+    {QStringLiteral("town"), ccForm1_directory::TownBox},
+    {QStringLiteral("phone"), ccForm1_directory::PhoneBox},
+    {QStringLiteral("modem-phone"), ccForm1_directory::ModemPhoneBox},
+};
+
+int add(ccForm1_directory& form, const CtlOptions& o, const QStringList& positional)
 {
-    const QHash<QString, int> boxes = {
-        {QStringLiteral("--address"), ccForm1_directory::AddressBox},
-        {QStringLiteral("--town"), ccForm1_directory::TownBox},
-        {QStringLiteral("--phone"), ccForm1_directory::PhoneBox},
-        {QStringLiteral("--modem-phone"), ccForm1_directory::ModemPhoneBox},
-    };
-    QStringList positional;
     QHash<int, QString> values;
-    while (!args.isEmpty()) {
-        QString a = args.takeFirst();
-        if (!a.startsWith(QLatin1String("--"))) {
-            positional << a;
-            continue;
-        }
-        QString value;
-        const qsizetype eq = a.indexOf(QLatin1Char('='));
-        if (eq > 0) {
-            value = a.mid(eq + 1);
-            a.truncate(eq);
-        } else if (!args.isEmpty()) {
-            value = args.takeFirst();
-        } else {
-            return usage(QStringLiteral("%1 needs a value").arg(a));
-        }
-        if (!boxes.contains(a))
-            return usage(QStringLiteral("unknown option %1").arg(a));
-        values.insert(boxes.value(a), value);
+    for (const auto& [name, box] : kBoxOptions) {
+        if (o.isSet(name))
+            values.insert(box, o.value(name));
     }
     if (positional.size() != 2)
         return usage(QStringLiteral("add needs ID and NAME"));
@@ -113,14 +96,17 @@ int run(const CtlOptions& o)
     if (o.args.isEmpty())
         return usage(QStringLiteral("no directory command given"));
     const QString sub = o.args.first();
-    QStringList args = o.args.mid(1);
-    bool yes = o.yes;
-    if (sub == QLatin1String("delete"))
-        yes = args.removeAll(QStringLiteral("--yes")) > 0 || yes;
+    const QStringList args = o.args.mid(1);
+    const bool yes = o.yes;
     if (sub != QLatin1String("list") && sub != QLatin1String("add") && sub != QLatin1String("delete")
         && sub != QLatin1String("compact"))
         return usage(QStringLiteral("unknown directory command %1").arg(sub));
-    if ((sub == QLatin1String("list") && !args.isEmpty())
+    bool boxes = false;
+    for (const auto& option : kBoxOptions)
+        boxes = boxes || o.isSet(option.first);
+    if (boxes && sub != QLatin1String("add"))
+        return usage(QStringLiteral("only add takes --address, --town, --phone and --modem-phone"));
+    if ((sub == QLatin1String("list") && !args.isEmpty()) || (sub == QLatin1String("add") && args.size() != 2)
         || ((sub == QLatin1String("delete") || sub == QLatin1String("compact")) && args.size() != 1))
         return usage(QStringLiteral("wrong arguments for %1").arg(sub));
 
@@ -139,7 +125,7 @@ int run(const CtlOptions& o)
     if (sub == QLatin1String("list")) {
         result = list(form, o.json);
     } else if (sub == QLatin1String("add")) {
-        result = add(form, args);
+        result = add(form, o, args);
     } else if (select(form, args.first())) {
         const int before = op.messages().size();
         const bool done = sub == QLatin1String("delete") ? form.Command2_Click() : form.Command8_Click();
@@ -152,8 +138,13 @@ int run(const CtlOptions& o)
     return result;
 }
 
-const ctl::Registration registration({QStringLiteral("directory"), Usage,
-                                      QStringLiteral("list, add, delete or compact instruments of the directory"),
-                                      run});
+const ctl::Registration registration(
+    {QStringLiteral("directory"), Usage, QStringLiteral("list, add, delete or compact instruments of the directory"),
+     run,
+     {{QStringLiteral("address"), QStringLiteral("add: the instrument's address."), QStringLiteral("TEXT")},
+      {QStringLiteral("town"), QStringLiteral("add: its town and state."), QStringLiteral("TEXT")},
+      {QStringLiteral("phone"), QStringLiteral("add: the site's telephone."), QStringLiteral("TEXT")},
+      {QStringLiteral("modem-phone"), QStringLiteral("add: the number its modem answers."), QStringLiteral("TEXT")}},
+     false});
 
 } // namespace

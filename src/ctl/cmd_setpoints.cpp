@@ -156,19 +156,18 @@ private:
     std::unique_ptr<channels_transfer_engine> m_channels;
 };
 
-// --all or --channel N: 0 for all, the channel, or -1 on a usage error.
-int parseScope(const QStringList& args, int from)
+// --all or --channel N: 0 for all, the channel, or -1 when neither or both
+// were given or the channel is not one.
+int parseScope(const CtlOptions& o)
 {
-    const QStringList rest = args.mid(from);
-    if (rest == QStringList{QStringLiteral("--all")})
+    const bool all = o.isSet(QStringLiteral("all"));
+    if (o.isSet(QStringLiteral("channel")) == all)
+        return -1;
+    if (all)
         return 0;
-    if (rest.size() == 2 && rest[0] == QLatin1String("--channel")) {
-        bool ok = false;
-        const int n = rest[1].toInt(&ok);
-        if (ok && n >= 1 && n <= catalogue::kChannels)
-            return n;
-    }
-    return -1;
+    bool ok = false;
+    const int n = o.value(QStringLiteral("channel")).toInt(&ok);
+    return ok && n >= 1 && n <= catalogue::kChannels ? n : -1;
 }
 
 bool upload(Session& s, int channel)
@@ -260,21 +259,16 @@ bool mayDownload(const CtlOptions& o, int channel)
     return false;
 }
 
-int setpoints(const CtlOptions& given)
+int setpoints(const CtlOptions& o)
 {
-    // --yes and --force may also follow the command's own arguments.
-    CtlOptions o = given;
-    if (o.args.removeAll(QStringLiteral("--yes")) > 0)
-        o.yes = true;
-    const bool force = o.args.removeAll(QStringLiteral("--force")) > 0;
+    const bool force = o.isSet(QStringLiteral("force"));
     const QString sub = o.args.value(0);
-    const int channel = parseScope(o.args, 1);
+    const bool scoped = o.isSet(QStringLiteral("all")) || o.isSet(QStringLiteral("channel"));
+    const int channel = parseScope(o);
     if ((sub != QLatin1String("upload") && sub != QLatin1String("download") && sub != QLatin1String("diff"))
-        || (channel < 0 && sub != QLatin1String("diff"))
-        || (sub == QLatin1String("diff") && o.args.size() > 1 && channel < 0)) {
-        err(QStringLiteral("usage: setpoints upload (--all | --channel N) | download (--all | --channel N) "
-                           "[--force] | diff [--all | --channel N]"));
-        return ctl::Usage;
+        || o.args.size() != 1 || (channel < 0 && (sub != QLatin1String("diff") || scoped))) {
+        return ctl::usageError(QStringLiteral("setpoints"),
+                               QStringLiteral("give upload, download or diff, and --all or --channel N"));
     }
     if (sub == QLatin1String("diff"))
         return differences(o, qMax(0, channel));
@@ -368,10 +362,13 @@ int audit(const CtlOptions& o)
 
 const ctl::Registration setpointsCommand(
     {QStringLiteral("setpoints"),
-     QStringLiteral("upload (--all | --channel N) | download (--all | --channel N) [--force] | diff [--channel N]"),
+     QStringLiteral("upload (--all | --channel N) | download (--all | --channel N) [--force] | diff [--all | --channel N]"),
      QStringLiteral("upload the set points into the store, download the store into the instrument (channels "
                     "never uploaded or edited only with --force), or list what a download would change"),
-     setpoints});
+     setpoints,
+     {{QStringLiteral("all"), QStringLiteral("Every channel.")},
+      {QStringLiteral("channel"), QStringLiteral("One channel, 1 to 216."), QStringLiteral("N")},
+      {QStringLiteral("force"), QStringLiteral("Download channels that never came from the instrument.")}}});
 const ctl::Registration auditCommand({QStringLiteral("audit"), QString(),
                                       QStringLiteral("list the writes sent to the instrument and their outcome"),
                                       audit});

@@ -35,4 +35,14 @@ void progress(const QString& text)
     std::fflush(stderr);
 }
 
+int usageError(const QString& command, const QString& why)
+{
+    const Command* c = find(command);
+    const QString usage = c ? (c->name + QLatin1Char(' ') + c->usage).trimmed() : command;
+    std::fprintf(stderr, "q19ctl %s: %s\nUsage: q19ctl [options] %s\nRun \"q19ctl %s --help\" for its options.\n",
+                 command.toLocal8Bit().constData(), why.toLocal8Bit().constData(), usage.toLocal8Bit().constData(),
+                 command.toLocal8Bit().constData());
+    return Usage;
+}
+
 } // namespace ctl

@@ -1,6 +1,8 @@
 #include "ctl/ctl_connect.h"
 
 #include "directory/data_folder.h"
+#include "directory/directory_engine.h"
+#include "platform/tcp_line.h"
 #include "shell/builtin_simulator_line.h"
 
 #include <QEventLoop>
@@ -16,6 +18,32 @@ namespace {
 constexpr int kGiveUpMs = 120000;
 
 } // namespace
+
+QString selectedInstrument(const QString& dataDir)
+{
+    DataFolder folder(dataDir);
+    if (!folder.ensure())
+        return {};
+    HeadlessOperator op;
+    ccForm1_directory form(folder, op);
+    if (!form.Form_Load())
+        return {};
+    const QString id = form.openId();
+    form.Form_Unload();
+    return id;
+}
+
+Operator::Answer ConnectionOperator::ask(const Message& message)
+{
+    if (m_address.isEmpty() || message.title != QLatin1String("Invalid Port"))
+        return HeadlessOperator::ask(message);
+    Message network = message;
+    network.title = QStringLiteral("No Connection");
+    network.lines = {QStringLiteral("Cannot connect to the network address %1,").arg(m_address)};
+    if (!message.lines.isEmpty())
+        network.lines.append(message.lines.last());
+    return HeadlessOperator::ask(network);
+}
 
 Connection::Connection(const CtlOptions& options) : op(options.yes), m_options(options) {}
 
@@ -93,6 +121,8 @@ int Connection::open(const QString& command)
         return Failure;
     }
 
+    if (TcpLine::looksLikeTcp(engine.CommPort()))
+        op.setNetworkAddress(engine.CommPort());
     const qsizetype messagesBefore = op.messages().size();
     QObject::connect(&engine, &ccForm1_engine::identityAccepted, &engine, [this] { m_accepted = true; });
     progress(modem ? QStringLiteral("Dialling %1 on %2").arg(m_phone, engine.CommPort())

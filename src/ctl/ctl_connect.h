@@ -17,6 +17,23 @@
 
 namespace ctl {
 
+// The instrument the workstation selects at start: the directory form's
+// first row by name whose data base is there. Empty when there is none.
+QString selectedInstrument(const QString& dataDir);
+
+// Prints the dialogue's messages on stderr, as HeadlessOperator does; a
+// port that would not open names the network address when it is one, as the
+// port wording of the form would send a user looking for a serial device.
+class ConnectionOperator : public HeadlessOperator {
+public:
+    using HeadlessOperator::HeadlessOperator;
+    void setNetworkAddress(const QString& address) { m_address = address; }
+    Answer ask(const Message& message) override;
+
+private:
+    QString m_address;
+};
+
 class Connection {
 public:
     explicit Connection(const CtlOptions& options);
@@ -38,7 +55,7 @@ public:
     OpenViews views;
     LinkGlobals globals;
     SystemClock clock;
-    HeadlessOperator op;
+    ConnectionOperator op;
 
 private:
     CtlOptions m_options;

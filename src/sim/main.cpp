@@ -3,44 +3,18 @@
 #include "sim/sim_instrument.h"
 #include "sim/sim_server.h"
 
+#include <QCommandLineParser>
 #include <QCoreApplication>
 #include <QDateTime>
 #include <QFile>
 #include <QTextStream>
 
 #include <cstdio>
+#include <limits>
 
 namespace {
 
-const char* const Help = R"(Usage: q19sim (--pty | --tcp PORT) [options]
-
-A Glacinor Model Q-19 refrigeration scanner/controller with 216 channels and
-a living plant, for demos, training and tests.
-
-Transports (one of them):
-  --pty               Open a pseudo-terminal; its path is the first line on
-                      stdout. Point the workstation's port at that path.
-  --tcp PORT          Serve on 127.0.0.1:PORT, one client at a time.
-
-Instrument:
-  --version V         Firmware version text (default 9.6), e.g. 6.5, 8.7, 14.
-  --id N              Instrument ID (default 1).
-  --resets N          Number of resets reported (default 0).
-  --seed N            Seed of the plant's randomness (default 1).
-  --speed N           Plant time runs N times faster than real time (default 1).
-  --start "yyyy-MM-dd hh:mm"  Instrument clock at start (default: now).
-  --history-hours N   Hours the plant has run before start, filling the logs
-                      (default 24).
-  --alarm-log N, --data-log N, --power-log N
-                      Sizes of the three logs in records (200, 1000, 2000).
-  --modem             Put a Hayes modem in front: dial, CONNECT 9600, +++.
-  --nocomp            The instrument has no computer link: answers "nocomp".
-  --greet             Send "AT&FE0" at start also on a pty, where it waits for
-                      the first client (a line nobody listens to loses it, so
-                      by default only a reset greets on the line).
-  --scenario FILE     Read "key = value" lines (below) at start.
-  --help              This text.
-
+const char* const ScenarioHelp = R"(
 Scenario keys, also control commands on stdin (one per line; the answer
 "ok: ..." or "error: ..." goes to stderr). When stdin is a pipe and is
 closed, q19sim ends.
@@ -79,78 +53,127 @@ int usage(const QString& error)
 int main(int argc, char** argv)
 {
     QCoreApplication app(argc, argv);
-    const QStringList args = app.arguments().mid(1);
+    QCommandLineParser parser;
+    parser.setApplicationDescription(QStringLiteral(
+        "A Glacinor Model Q-19 refrigeration scanner/controller with 216 channels and\n"
+        "a living plant, for demos, training and tests. Give one of --pty and --tcp."));
+    const auto option = [&parser](const QString& name, const QString& help, const QString& value = {}) {
+        parser.addOption(QCommandLineOption(name, help, value));
+        return name;
+    };
+    const QString ptyOpt = option(QStringLiteral("pty"),
+                                  QStringLiteral("Open a pseudo-terminal; its path is the first line on stdout. "
+                                                 "Point the workstation's port at that path."));
+    const QString tcpOpt = option(QStringLiteral("tcp"), QStringLiteral("Serve on 127.0.0.1:PORT, one client at a time."),
+                                  QStringLiteral("PORT"));
+    const QString versionOpt = option(QStringLiteral("version"),
+                                      QStringLiteral("Firmware version text (default 9.6), e.g. 6.5, 8.7, 14."),
+                                      QStringLiteral("V"));
+    const QString idOpt = option(QStringLiteral("id"), QStringLiteral("Instrument ID (default 1)."), QStringLiteral("N"));
+    const QString resetsOpt = option(QStringLiteral("resets"), QStringLiteral("Number of resets reported (default 0)."),
+                                     QStringLiteral("N"));
+    const QString seedOpt = option(QStringLiteral("seed"), QStringLiteral("Seed of the plant's randomness (default 1)."),
+                                   QStringLiteral("N"));
+    const QString speedOpt = option(QStringLiteral("speed"),
+                                    QStringLiteral("Plant time runs N times faster than real time (default 1)."),
+                                    QStringLiteral("N"));
+    const QString startOpt = option(QStringLiteral("start"),
+                                    QStringLiteral("Instrument clock at start, \"yyyy-MM-dd hh:mm\" (default: now)."),
+                                    QStringLiteral("TIME"));
+    const QString historyOpt = option(QStringLiteral("history-hours"),
+                                      QStringLiteral("Hours the plant has run before start, filling the logs "
+                                                     "(default 24)."),
+                                      QStringLiteral("N"));
+    const QString alarmOpt = option(QStringLiteral("alarm-log"),
+                                    QStringLiteral("Size of the alarm log in records (default 200)."),
+                                    QStringLiteral("N"));
+    const QString dataOpt = option(QStringLiteral("data-log"),
+                                   QStringLiteral("Size of the data log in records (default 1000)."),
+                                   QStringLiteral("N"));
+    const QString powerOpt = option(QStringLiteral("power-log"),
+                                    QStringLiteral("Size of the power log in records (default 2000)."),
+                                    QStringLiteral("N"));
+    const QString modemOpt = option(QStringLiteral("modem"),
+                                    QStringLiteral("Put a Hayes modem in front: dial, CONNECT 9600, +++."));
+    const QString nocompOpt = option(QStringLiteral("nocomp"),
+                                     QStringLiteral("The instrument has no computer link: answers \"nocomp\"."));
+    const QString greetOpt = option(QStringLiteral("greet"),
+                                    QStringLiteral("Send \"AT&FE0\" at start also on a pty, where it waits for the "
+                                                   "first client (a line nobody listens to loses it, so by default "
+                                                   "only a reset greets on the line)."));
+    const QString scenarioOpt = option(QStringLiteral("scenario"),
+                                       QStringLiteral("Read \"key = value\" lines (below) at start."),
+                                       QStringLiteral("FILE"));
+    parser.addOption(QCommandLineOption({QStringLiteral("h"), QStringLiteral("help")}, QStringLiteral("This text.")));
+
+    if (!parser.parse(app.arguments()))
+        return usage(parser.errorText());
+    if (parser.isSet(QStringLiteral("help"))) {
+        QString help = parser.helpText();
+        // Qt names the program by the path it was started with.
+        const qsizetype options = help.indexOf(QLatin1String(" [options]"));
+        if (help.startsWith(QLatin1String("Usage: ")) && options > 0)
+            help.replace(0, options, QStringLiteral("Usage: q19sim"));
+        std::fputs(qPrintable(help + QLatin1Char('\n') + QLatin1String(ScenarioHelp)), stdout);
+        return 0;
+    }
+    if (!parser.positionalArguments().isEmpty())
+        return usage(QStringLiteral("unexpected argument %1").arg(parser.positionalArguments().first()));
 
     sim::Options options;
     sim::Instrument::Settings settings;
-    bool pty = false, greeting = false, nocomp = false;
-    int tcpPort = -1;
-    QString scenario;
-    for (int i = 0; i < args.size(); ++i) {
-        const QString a = args[i];
-        auto value = [&](QString& out) {
-            if (i + 1 >= args.size())
-                return false;
-            out = args[++i];
+    const bool pty = parser.isSet(ptyOpt);
+    const bool greeting = parser.isSet(greetOpt);
+    const bool nocomp = parser.isSet(nocompOpt);
+    settings.modem = parser.isSet(modemOpt);
+    const QString scenario = parser.value(scenarioOpt);
+    // Each check names the option whose value is bad.
+    const auto integer = [&](const QString& name, int& out, int min) {
+        if (!parser.isSet(name))
             return true;
-        };
-        auto integer = [&](int& out) {
-            QString v;
-            bool ok = false;
-            if (value(v))
-                out = v.toInt(&ok);
-            return ok;
-        };
-        QString v;
-        bool ok = true;
-        if (a == QLatin1String("--help") || a == QLatin1String("-h")) {
-            std::fputs(Help, stdout);
-            return 0;
-        } else if (a == QLatin1String("--pty")) {
-            pty = true;
-        } else if (a == QLatin1String("--tcp")) {
-            ok = integer(tcpPort) && tcpPort > 0 && tcpPort < 65536;
-        } else if (a == QLatin1String("--version")) {
-            ok = value(v) && !v.isEmpty();
-            options.version = v.toLatin1();
-        } else if (a == QLatin1String("--id")) {
-            ok = integer(settings.id);
-        } else if (a == QLatin1String("--resets")) {
-            ok = integer(options.resets);
-        } else if (a == QLatin1String("--seed")) {
-            int seed = 0;
-            ok = integer(seed);
-            options.seed = quint32(seed);
-        } else if (a == QLatin1String("--speed")) {
-            ok = value(v);
-            settings.speed = v.toDouble(&ok);
-            ok = ok && settings.speed > 0;
-        } else if (a == QLatin1String("--start")) {
-            ok = value(v);
-            options.start = QDateTime::fromString(v, QStringLiteral("yyyy-MM-dd hh:mm"));
-            ok = ok && options.start.isValid();
-        } else if (a == QLatin1String("--history-hours")) {
-            ok = integer(options.historyHours) && options.historyHours >= 0;
-        } else if (a == QLatin1String("--alarm-log")) {
-            ok = integer(options.alarmCapacity) && options.alarmCapacity > 0;
-        } else if (a == QLatin1String("--data-log")) {
-            ok = integer(options.historyCapacity) && options.historyCapacity > 0;
-        } else if (a == QLatin1String("--power-log")) {
-            ok = integer(options.powerCapacity) && options.powerCapacity > 0;
-        } else if (a == QLatin1String("--modem")) {
-            settings.modem = true;
-        } else if (a == QLatin1String("--nocomp")) {
-            nocomp = true;
-        } else if (a == QLatin1String("--greet")) {
-            greeting = true;
-        } else if (a == QLatin1String("--scenario")) {
-            ok = value(scenario);
-        } else {
-            return usage(QStringLiteral("unknown option %1").arg(a));
-        }
-        if (!ok)
-            return usage(QStringLiteral("bad or missing value for %1").arg(a));
+        bool ok = false;
+        const int v = parser.value(name).toInt(&ok);
+        if (ok && v >= min)
+            out = v;
+        return ok && v >= min;
+    };
+    int tcpPort = -1;
+    int seed = int(options.seed);
+    QString bad;
+    if (!integer(tcpOpt, tcpPort, 1) || (parser.isSet(tcpOpt) && tcpPort > 65535))
+        bad = tcpOpt;
+    else if (parser.isSet(versionOpt) && parser.value(versionOpt).isEmpty())
+        bad = versionOpt;
+    else if (!integer(idOpt, settings.id, std::numeric_limits<int>::min()))
+        bad = idOpt;
+    else if (!integer(resetsOpt, options.resets, std::numeric_limits<int>::min()))
+        bad = resetsOpt;
+    else if (!integer(seedOpt, seed, std::numeric_limits<int>::min()))
+        bad = seedOpt;
+    else if (!integer(historyOpt, options.historyHours, 0))
+        bad = historyOpt;
+    else if (!integer(alarmOpt, options.alarmCapacity, 1))
+        bad = alarmOpt;
+    else if (!integer(dataOpt, options.historyCapacity, 1))
+        bad = dataOpt;
+    else if (!integer(powerOpt, options.powerCapacity, 1))
+        bad = powerOpt;
+    if (bad.isEmpty() && parser.isSet(speedOpt)) {
+        bool ok = false;
+        settings.speed = parser.value(speedOpt).toDouble(&ok);
+        if (!ok || settings.speed <= 0)
+            bad = speedOpt;
     }
+    if (bad.isEmpty() && parser.isSet(startOpt)) {
+        options.start = QDateTime::fromString(parser.value(startOpt), QStringLiteral("yyyy-MM-dd hh:mm"));
+        if (!options.start.isValid())
+            bad = startOpt;
+    }
+    if (!bad.isEmpty())
+        return usage(QStringLiteral("bad value for --%1: %2").arg(bad, parser.value(bad)));
+    if (parser.isSet(versionOpt))
+        options.version = parser.value(versionOpt).toLatin1();
+    options.seed = quint32(seed);
     if (pty == (tcpPort > 0))
         return usage(QStringLiteral("give exactly one of --pty and --tcp PORT"));
 

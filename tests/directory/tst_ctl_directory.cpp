@@ -33,7 +33,7 @@ void TestCtlDirectory::commandsInSequence_data()
     QTest::newRow("delete last") << QStringList{"delete", "1", "--yes"} << 1 << ""
                                  << "Can't Delete: There is only one record left,";
     QTest::newRow("unknown id") << QStringList{"compact", "99"} << 1 << "" << "there is no Glacinor with ID 99";
-    QTest::newRow("usage") << QStringList{"add", "5"} << 2 << "" << "Usage: q19ctl directory";
+    QTest::newRow("usage") << QStringList{"add", "5"} << 2 << "" << "Run \"q19ctl directory --help\"";
 }
 
 void TestCtlDirectory::commandsInSequence()

@@ -63,8 +63,10 @@ void TestE2EStatus::ctlOneRequest_data()
     QTest::newRow("status, version 7 has no suction or pressure boxes")
         << QStringList{"--json", "status"} << "7" << QString() << 0 << QStringList{"\"channels\":["}
         << QStringList{"\"suction\":[", "\"pressures\":["};
-    QTest::newRow("status, version 14 has PID percentages")
-        << QStringList{"--json", "status"} << "14" << QString() << 0 << QStringList{"\"pid\":"} << QStringList{};
+    // Instrument 12 has no store here, so no channel has a PID control kind.
+    QTest::newRow("status, version 14, options after the command, no PID channels")
+        << QStringList{"status", "--json"} << "14" << QString() << 0 << QStringList{"\"channels\":["}
+        << QStringList{"\"pid\"", "fanPercent"};
     QTest::newRow("status as a table")
         << QStringList{"status"} << "9.6" << QString() << 0
         << QStringList{"Glacinor ID 12", " 107  Ovr Rge", " 150  Not Con", "Suction pressures:"} << QStringList{};
