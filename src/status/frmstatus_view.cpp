@@ -3,6 +3,7 @@
 #include "platform/widget_control_state.h"
 #include "platform/widget_printer.h"
 #include "status/frmstatus_engine.h"
+#include "status/status_cycle.h"
 
 #include <QGridLayout>
 #include <QGroupBox>
@@ -18,6 +19,18 @@
 void StatusViewBase::bind(const ControlState& state, QWidget* w, bool data)
 {
     m_bindings.append({&state, w, data});
+}
+
+void StatusViewBase::bindInterval(StatusCycle& cycle, QSpinBox* spinner)
+{
+    m_cycle = &cycle;
+    m_interval = spinner;
+    spinner->setRange(StatusCycle::IntervalMin, StatusCycle::SpinnerMax);
+    bind(cycle.UpDown1, spinner);
+    connect(spinner, &QSpinBox::valueChanged, this, [this](int value) {
+        if (!m_refreshing && m_cycle->UpDown1.value.toInt() != value)
+            m_cycle->UpDown1_Change(value);
+    });
 }
 
 void StatusViewBase::scheduleRefresh()
@@ -37,6 +50,11 @@ void StatusViewBase::refresh()
 {
     const bool old = stale();
     const QString age = old ? ageText() : QString();
+    // Showing the engine's state is no step of the operator's: nothing the
+    // widgets signal meanwhile may be written back.
+    m_refreshing = true;
+    if (m_interval)
+        m_interval->setMaximum(qMax(int(StatusCycle::SpinnerMax), m_cycle->UpDown1.value.toInt()));
     for (const Binding& b : m_bindings) {
         applyControlState(*b.state, b.widget);
         if (b.data && old) {
@@ -44,6 +62,7 @@ void StatusViewBase::refresh()
             b.widget->setToolTip(age);
         }
     }
+    m_refreshing = false;
     afterRefresh();
 }
 
@@ -101,7 +120,6 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     time->setMinimumWidth(time->fontMetrics().horizontalAdvance(QStringLiteral("00/00/0000 00:00:00")) + 16);
     auto* interval = new QSpinBox(page);
     interval->setObjectName(QStringLiteral("UpDown1"));
-    interval->setRange(StatusCycle::IntervalMin, StatusCycle::SpinnerMax);
     interval->setSuffix(QStringLiteral(" s"));
     auto* intervalText = box(QStringLiteral("Text10_1"), page);
     intervalText->hide(); // the spinner shows the same number
@@ -134,7 +152,7 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     bind(c.Text10[0], id);
     bind(c.Text10[1], intervalText);
     bind(c.Text10[2], time);
-    bind(c.UpDown1, interval);
+    bindInterval(c, interval);
     bind(c.nowstatus, now);
     bind(c.startstatus, start);
     bind(c.stopstatus, stop);
@@ -270,10 +288,6 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     // preview prints it or saves it as a PDF file.
     connect(print, &QPushButton::clicked, this, [this] {
         printPreview(this, m_e.printgraph.text, [this](Printer& p) { m_e.printgraph_Click(p); });
-    });
-    connect(interval, &QSpinBox::valueChanged, this, [this](int value) {
-        if (m_e.cycle.UpDown1.value.toInt() != value)
-            m_e.cycle.UpDown1_Change(value);
     });
     connect(clear, &QPushButton::clicked, &e, &frmstatus_engine::Command2_Click);
     connect(numbers, &QPushButton::clicked, &e, &frmstatus_engine::Cmdselchan_Click);

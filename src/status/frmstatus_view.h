@@ -5,7 +5,9 @@
 #include <QWidget>
 
 class frmstatus_engine;
+class QSpinBox;
 class QTimer;
+class StatusCycle;
 struct ControlState;
 
 // Status views' shared drawing: the engine's controls applied to widgets of
@@ -18,6 +20,10 @@ public:
 protected:
     // Widgets are found by objectName, the control's name.
     void bind(const ControlState& state, QWidget* w, bool data = false);
+    // The interval spinner: only the operator's steps reach the cycle (and
+    // its store); a stored interval above the spinner's own limit is shown
+    // as it is, never cut.
+    void bindInterval(StatusCycle& cycle, QSpinBox* spinner);
     void scheduleRefresh();
     void refresh();
     // The stale state as the cycle tells it: dims the data widgets.
@@ -34,6 +40,9 @@ private:
     };
     QList<Binding> m_bindings;
     QTimer* m_timer = nullptr;
+    StatusCycle* m_cycle = nullptr;
+    QSpinBox* m_interval = nullptr;
+    bool m_refreshing = false;
 };
 
 // frmstatus: the temperature status of the selected channels on one tab,

@@ -62,7 +62,6 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     time->setFont(tf);
     auto* interval = new QSpinBox(this);
     interval->setObjectName(QStringLiteral("UpDown1"));
-    interval->setRange(StatusCycle::IntervalMin, StatusCycle::SpinnerMax);
     interval->setSuffix(QStringLiteral(" s"));
     auto* now = new QPushButton(this);
     now->setObjectName(QStringLiteral("nowstatus"));
@@ -96,7 +95,7 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     v->addWidget(ceased2);
     bind(c.Text10[0], id);
     bind(c.Text10[2], time);
-    bind(c.UpDown1, interval);
+    bindInterval(c, interval);
     bind(c.nowstatus, now);
     bind(c.startstatus, start);
     bind(c.stopstatus, stop);
@@ -259,10 +258,6 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
         printPreview(this, m_e.printgraph.text, [this](Printer& p) { m_e.printgraph_Click(p); });
     });
     connect(panel, &QPushButton::clicked, &e, &frmstatusp_engine::dbaseload_Click);
-    connect(interval, &QSpinBox::valueChanged, this, [this](int value) {
-        if (m_e.cycle.UpDown1.value.toInt() != value)
-            m_e.cycle.UpDown1_Change(value);
-    });
     connect(&e, &frmstatusp_engine::changed, this, &frmstatusp_view::scheduleRefresh);
     refresh();
 }

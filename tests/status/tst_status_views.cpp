@@ -12,6 +12,7 @@
 #include <QApplication>
 #include <QLabel>
 #include <QPrintPreviewDialog>
+#include <QSpinBox>
 #include <QTimer>
 #include <QTemporaryDir>
 #include <QTest>
@@ -21,6 +22,8 @@ class tst_status_views : public QObject {
 private slots:
     void temperatureViewFollowsEngine();
     void pressureViewSwapsPanels();
+    void openingKeepsStoredInterval_data();
+    void openingKeepsStoredInterval();
 };
 
 void tst_status_views::temperatureViewFollowsEngine()
@@ -97,6 +100,52 @@ void tst_status_views::pressureViewSwapsPanels()
     QTRY_VERIFY(v.findChild<QWidget*>(QStringLiteral("Picture1"))->isVisible());
     QVERIFY(!v.findChild<QWidget*>(QStringLiteral("chanframe_0"))->isVisible());
     QCOMPARE(v.findChild<QAbstractButton*>(QStringLiteral("dbaseload"))->text(), QStringLiteral("Glacinor Status"));
+}
+
+void tst_status_views::openingKeepsStoredInterval_data()
+{
+    QTest::addColumn<bool>("pressure");
+    QTest::addColumn<int>("stored");
+    QTest::newRow("temperature, 60 beyond the spinner") << false << 60;
+    QTest::newRow("temperature, 30 at the spinner's top") << false << 30;
+    QTest::newRow("pressure, 31 just beyond the spinner") << true << 31;
+    QTest::newRow("pressure, 120 at the stored limit") << true << 120;
+}
+
+// Opening a view shows the stored interval and writes nothing; only the
+// operator's step on the spinner goes to the store.
+void tst_status_views::openingKeepsStoredInterval()
+{
+    QFETCH(bool, pressure);
+    QFETCH(int, stored);
+    QTemporaryDir dir;
+    const QString path = dir.filePath(QStringLiteral("t-7.db"));
+    QVERIFY(createInstrumentTemplate(path));
+    const int row = pressure ? kInfoPressureIntervalRow : kInfoTemperatureIntervalRow;
+    const auto storedText = [&] { return InstrumentStore::open(path)->info(row, kInfoIntervalColumn).toString(); };
+    QVERIFY(InstrumentStore::open(path)->setInfo(row, kInfoIntervalColumn, QString::number(stored)));
+    ManualClock clock;
+    TestLink link(clock);
+    ScriptedOperator op;
+    OpenViews views;
+    frmstatus_engine temperature(link, clock, op, views);
+    frmstatusp_engine pressureEngine(link, clock, op, views);
+    std::unique_ptr<QWidget> v;
+    if (pressure) {
+        QVERIFY(pressureEngine.Form_Load(QStringLiteral("7"), path));
+        v = std::make_unique<frmstatusp_view>(pressureEngine);
+    } else {
+        QVERIFY(temperature.Form_Load(QStringLiteral("7"), path));
+        v = std::make_unique<frmstatus_view>(temperature);
+    }
+    v->show();
+    QVERIFY(QTest::qWaitForWindowExposed(v.get()));
+    auto* spinner = v->findChild<QSpinBox*>(QStringLiteral("UpDown1"));
+    QVERIFY(spinner);
+    QCOMPARE(storedText(), QString::number(stored));
+    QCOMPARE(spinner->value(), stored);
+    spinner->stepDown();
+    QTRY_COMPARE(storedText(), QString::number(stored - 1));
 }
 
 QTEST_MAIN(tst_status_views)
