@@ -33,6 +33,12 @@ void StatusViewBase::bindInterval(StatusCycle& cycle, QSpinBox* spinner)
     });
 }
 
+void StatusViewBase::unitTip(QWidget* w, const QString& tip)
+{
+    m_unitTips.append({w, tip});
+    w->setToolTip(tip);
+}
+
 void StatusViewBase::scheduleRefresh()
 {
     // Replies arrive in batches and timers fire in bursts: one redraw per burst.
@@ -61,6 +67,11 @@ void StatusViewBase::refresh()
             b.widget->setEnabled(false);
             b.widget->setToolTip(age);
         }
+    }
+    for (const auto& [w, tip] : std::as_const(m_unitTips)) {
+        const QString now = w->toolTip();
+        if (!now.startsWith(tip))
+            w->setToolTip(now.isEmpty() ? tip : tip + QLatin1Char('\n') + now);
     }
     m_refreshing = false;
     afterRefresh();
@@ -164,12 +175,14 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     auto* grid = new QGridLayout(rowsBox);
     grid->setHorizontalSpacing(6);
     grid->setVerticalSpacing(2);
-    const QStringList heads = {QStringLiteral("Channel"), QStringLiteral("Temp"), QStringLiteral("Bank"),
-                               QStringLiteral("Assoc 1"), QStringLiteral("Assoc 2"), QStringLiteral("Assoc 3"),
-                               QStringLiteral("Outputs"), QString(), QString(), QString(), QStringLiteral("PID"),
-                               QStringLiteral("Alarm")};
+    // The replies carry no units: the heads say them.
+    const QStringList heads = {QStringLiteral("Channel"),    QStringLiteral("Temp °C"),    QStringLiteral("Bank"),
+                               QStringLiteral("Assoc 1 °C"), QStringLiteral("Assoc 2 °C"), QStringLiteral("Assoc 3 °C"),
+                               QStringLiteral("Outputs"),    QString(),                    QString(),
+                               QString(),                    QStringLiteral("PID %"),      QStringLiteral("Alarm")};
     for (int col = 0; col < heads.size(); ++col) {
         auto* h = new QLabel(heads[col], rowsBox);
+        h->setObjectName(indexed("head", col));
         QFont f = h->font();
         f.setBold(true);
         h->setFont(f);
@@ -224,13 +237,19 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
 
     // Suction pressures and the pressure inputs of the banks.
     auto* plant = new QHBoxLayout;
-    auto* sucBox = new QGroupBox(QStringLiteral("Suction Pressures"), page);
+    auto* sucBox = new QGroupBox(QStringLiteral("Suction Pressures KPA"), page);
     auto* sucGrid = new QGridLayout(sucBox);
     for (int i = 0; i < frmstatus_engine::Suctions; ++i) {
+        auto* l = new QLabel(QStringLiteral("Suc %1").arg(i + 1), sucBox);
+        l->setObjectName(indexed("sucLabel", i));
+        l->setAlignment(Qt::AlignCenter);
         auto* s = box(indexed("suc", i), sucBox);
         s->setMinimumWidth(48);
-        sucGrid->addWidget(s, 0, i);
+        unitTip(s, QStringLiteral("Suction pressure %1, in KPA").arg(i + 1));
+        sucGrid->addWidget(l, 0, i);
+        sucGrid->addWidget(s, 1, i);
         bind(e.suc[i], s, true);
+        m_sucLabels.append(std::pair<QWidget*, QWidget*>(l, s));
     }
     auto* pBox = new QGroupBox(QStringLiteral("Pressures"), page);
     auto* pGrid = new QGridLayout(pBox);
@@ -310,6 +329,9 @@ QString frmstatus_view::ageText() const
 
 void frmstatus_view::afterRefresh()
 {
+    // A suction label goes with its box.
+    for (const auto& [label, value] : std::as_const(m_sucLabels))
+        label->setVisible(!value->isHidden());
     // A hidden frame hides its whole row.
     for (int i = 0; i < m_rows.size(); ++i) {
         if (!m_e.chanframe[i].visible) {

@@ -24,6 +24,9 @@ protected:
     // its store); a stored interval above the spinner's own limit is shown
     // as it is, never cut.
     void bindInterval(StatusCycle& cycle, QSpinBox* spinner);
+    // A tool tip with the unit of a data box, kept ahead of what the engine
+    // or the stale state puts there.
+    void unitTip(QWidget* w, const QString& tip);
     void scheduleRefresh();
     void refresh();
     // The stale state as the cycle tells it: dims the data widgets.
@@ -39,6 +42,7 @@ private:
         bool data;
     };
     QList<Binding> m_bindings;
+    QList<std::pair<QWidget*, QString>> m_unitTips;
     QTimer* m_timer = nullptr;
     StatusCycle* m_cycle = nullptr;
     QSpinBox* m_interval = nullptr;
@@ -62,4 +66,5 @@ protected:
 private:
     frmstatus_engine& m_e;
     QList<QList<QWidget*>> m_rows;
+    QList<std::pair<QWidget*, QWidget*>> m_sucLabels; // label, box
 };
