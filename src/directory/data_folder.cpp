@@ -1,5 +1,6 @@
 #include "directory/data_folder.h"
 
+#include "directory/demo_store.h"
 #include "setpoints/instrument_schema.h"
 
 #include <QDir>
@@ -174,28 +175,49 @@ bool DataFolder::createLayoutTemplates(QString* error) const
     return true;
 }
 
+// The demo instrument's files: the templates' copies, its line set to the
+// built-in simulator, and the set points the simulator holds.
+bool DataFolder::createDemoFiles(QString* error) const
+{
+    const QString db = instrumentFile(DemoId);
+    if (!copyReplacing(templateFile(), db, error))
+        return false;
+    for (int n = 0; n < LayoutCount; ++n) {
+        if (!copyReplacing(layoutTemplate(n), layoutFile(n, DemoId), error))
+            return false;
+    }
+    if (!fillDemoSetpoints(db, error)) {
+        removeDataBase(db);
+        return false;
+    }
+    return true;
+}
+
+namespace {
+
+bool setDemoLine(const QString& db, QString* error)
+{
+    std::unique_ptr<Store> store = Store::open(db, error);
+    if (!store)
+        return false;
+    std::unique_ptr<Recordset> info = store->openRecordset(kInfoTable);
+    if (!info || !info->setCell(kInfoPortRow, kInfoConnectionColumn, DataFolder::DemoPort)
+        || !info->setCell(kInfoConnectionTypeRow, kInfoConnectionColumn, DirectConnection)) {
+        setError(error, info ? info->lastError() : store->lastError());
+        return false;
+    }
+    return true;
+}
+
+} // namespace
+
 // A folder without a directory gets one with the demo instrument, so that the
 // program opens ready to connect to the built-in simulator.
 bool DataFolder::createDemoInstrument(QString* error) const
 {
     const QString db = instrumentFile(DemoId);
-    if (!QFileInfo::exists(db)) {
-        if (!copyReplacing(templateFile(), db, error))
-            return false;
-        for (int n = 0; n < LayoutCount; ++n) {
-            if (!copyReplacing(layoutTemplate(n), layoutFile(n, DemoId), error))
-                return false;
-        }
-        std::unique_ptr<Store> store = Store::open(db, error);
-        if (!store)
-            return false;
-        std::unique_ptr<Recordset> info = store->openRecordset(kInfoTable);
-        if (!info || !info->setCell(kInfoPortRow, kInfoConnectionColumn, DemoPort)
-            || !info->setCell(kInfoConnectionTypeRow, kInfoConnectionColumn, DirectConnection)) {
-            setError(error, info ? info->lastError() : store->lastError());
-            return false;
-        }
-    }
+    if (!QFileInfo::exists(db) && (!createDemoFiles(error) || !setDemoLine(db, error)))
+        return false;
 
     // Built under a temporary name, so that a failure leaves no half directory
     // that the next start would take for a real one.
@@ -221,6 +243,60 @@ bool DataFolder::createDemoInstrument(QString* error) const
         removeDataBase(partial);
         setError(error, QStringLiteral("%1 cannot be created.").arg(QDir::toNativeSeparators(directoryFile())));
         return false;
+    }
+    return true;
+}
+
+// The demo's row in an existing directory, under the demo's name unless
+// another instrument took it.
+bool DataFolder::addDemoRow(QString* error) const
+{
+    std::unique_ptr<Store> store = Store::open(directoryFile(), error);
+    if (!store)
+        return false;
+    std::unique_ptr<Recordset> rows = store->openRecordset(Table1::TableName);
+    if (!rows) {
+        setError(error, store->lastError());
+        return false;
+    }
+    bool nameTaken = false;
+    for (int i = 0; i < rows->RecordCount(); ++i) {
+        rows->setAbsolutePosition(i);
+        if (rows->value(Table1::ID).toString() == DemoId)
+            return true;
+        nameTaken = nameTaken || rows->value(Table1::Name).toString().compare(DemoName, Qt::CaseInsensitive) == 0;
+    }
+    const QString name = nameTaken ? DemoName + QStringLiteral(" ") + DemoId : DemoName;
+    if (!rows->AddNew() || !rows->setValue(Table1::ID, DemoId.toInt()) || !rows->setValue(Table1::Name, name)
+        || !rows->Update()) {
+        setError(error, rows->lastError());
+        return false;
+    }
+    return true;
+}
+
+bool DataFolder::ensureDemo(QString* error)
+{
+    if (!ensure(error))
+        return false;
+    const QString db = instrumentFile(DemoId);
+    if (!QFileInfo::exists(db) && !createDemoFiles(error))
+        return false;
+    return addDemoRow(error) && setDemoLine(db, error);
+}
+
+bool DataFolder::removeProgramFiles(QString* error)
+{
+    QDir dir(m_path);
+    if (!dir.exists())
+        return true;
+    const QStringList ours = {DirectoryFileName, TemplateFileName, QStringLiteral("t-*.db"),
+                              QStringLiteral("t-*.bak"), QStringLiteral("s*.slf")};
+    for (const QString& name : dir.entryList(ours, QDir::Files | QDir::Hidden)) {
+        if (!removeDataBase(dir.filePath(name))) {
+            setError(error, QStringLiteral("%1 cannot be removed.").arg(QDir::toNativeSeparators(dir.filePath(name))));
+            return false;
+        }
     }
     return true;
 }

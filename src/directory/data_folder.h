@@ -51,6 +51,13 @@ public:
     // templates, and q-19.db with the demo instrument and its files. Files
     // that exist are left as they are. False with the reason in *error.
     bool ensure(QString* error = nullptr);
+    // The demo's start: ensure(), then the demo instrument back if its row or
+    // its files have gone, and its line set to the built-in simulator.
+    bool ensureDemo(QString* error = nullptr);
+    // Removes every file the program keeps in the folder (directory,
+    // templates, instruments, back-ups, layouts); other files stay. The demo
+    // starts afresh from here.
+    bool removeProgramFiles(QString* error = nullptr);
 
     QString directoryFile() const;
     QString templateFile() const;
@@ -74,6 +81,8 @@ private:
     bool createDirectory(QString* error) const;
     bool createLayoutTemplates(QString* error) const;
     bool createDemoInstrument(QString* error) const;
+    bool createDemoFiles(QString* error) const;
+    bool addDemoRow(QString* error) const;
 
     QString m_path;
 };

@@ -233,10 +233,17 @@ bool ccForm1_directory::Command4_Click()
         done();
         return false;
     }
-    const QString name = Text1[NameBox].text;
+    // The name is as mandatory as the ID: the list shows instruments by it.
+    const QString name = Text1[NameBox].text.trimmed();
+    if (name.isEmpty()) {
+        m_op.message(QStringLiteral("Mandatory"), {QStringLiteral("You must enter a \"Name\""),
+                                                   QStringLiteral("for the Glacinor. Re enter the correct data")});
+        done();
+        return false;
+    }
+    Text1[NameBox].text = name;
     for (const QStringList& row : rows()) {
-        if (row.at(Table1::ID) == id
-            || (!name.isEmpty() && row.at(Table1::Name).compare(name, Qt::CaseInsensitive) == 0)) {
+        if (row.at(Table1::ID) == id || row.at(Table1::Name).trimmed().compare(name, Qt::CaseInsensitive) == 0) {
             m_op.message(QStringLiteral("Duplicate ID Number"),
                          {QStringLiteral("You have entered a Glacinor ID number or Last Name"),
                           QStringLiteral("that already exists. Re enter the correct data")});
@@ -303,6 +310,14 @@ bool ccForm1_directory::Command2_Click()
 {
     if (!m_Data1 || adding)
         return false;
+    // Its file is the one the connection and the views work on.
+    const QString connected = m_connectedId ? m_connectedId() : QString();
+    if (!connected.isEmpty() && Text1[IdBox].text == connected) {
+        m_op.message(QStringLiteral("Can't Delete"),
+                     {QStringLiteral("This Glacinor is connected,"),
+                      QStringLiteral("Disconnect it first, then delete it.")});
+        return false;
+    }
     const Operator::Answer answer = m_op.message(
         QStringLiteral("Delete Glacinor"),
         {QStringLiteral("Are you sure, this will permanatly delete this record and data base for this Glacinor"),

@@ -5,6 +5,7 @@
 
 #include <QObject>
 #include <QStringList>
+#include <functional>
 #include <memory>
 
 class InstrumentStore;
@@ -74,6 +75,10 @@ public:
     bool Command8_Click() { return compact_directory(); }
     bool compact_directory();
 
+    // Asked at a delete: the ID of the instrument the line is connected to,
+    // empty when none. Its row and files cannot go while the line is up.
+    void setConnectedInstrument(std::function<QString()> connectedId) { m_connectedId = std::move(connectedId); }
+
     // The instrument whose data base is open, its info table (null when none).
     QString openId() const { return m_openId; }
     Recordset* info() const { return m_info; }
@@ -116,6 +121,7 @@ private:
     std::unique_ptr<InstrumentStore> m_instrument;
     Recordset* m_info = nullptr; // of m_instrument
     QString m_openId;
+    std::function<QString()> m_connectedId;
     // A box other than ID and Name was typed into while browsing.
     bool m_boundDirty = false;
     // The new row of an Add waits in the boxes until Update.

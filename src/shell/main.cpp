@@ -23,6 +23,8 @@
 #include <QMessageBox>
 #include <QStandardPaths>
 
+#include <cstdio>
+
 namespace {
 
 // The demo keeps its own folder, so that trying the program never touches
@@ -52,12 +54,21 @@ int main(int argc, char* argv[])
                                   QStringLiteral("Open the demo data folder, whose instrument is the built-in simulator."));
     const QCommandLineOption dataDir(QStringLiteral("data-dir"), QStringLiteral("Use DIR as the data folder."),
                                      QStringLiteral("DIR"));
+    const QCommandLineOption reset(QStringLiteral("reset"),
+                                   QStringLiteral("With --demo: start the demo afresh (its directory, instruments and "
+                                                  "set points as at the first start)."));
     parser.addOption(demo);
     parser.addOption(dataDir);
+    parser.addOption(reset);
     parser.process(app);
+    const bool isDemo = parser.isSet(demo);
+    if (parser.isSet(reset) && !isDemo) {
+        std::fprintf(stderr, "q19: --reset goes with --demo only\n");
+        return 2;
+    }
 
     const QString folderPath = parser.isSet(dataDir) ? parser.value(dataDir)
-                               : parser.isSet(demo)  ? demoFolder()
+                               : isDemo              ? demoFolder()
                                                      : DataFolder::location();
     DataFolder folder(folderPath);
 
@@ -65,8 +76,12 @@ int main(int argc, char* argv[])
     splash->show();
     app.processEvents();
 
+    // The demo always comes up on its instrument and the built-in simulator,
+    // whatever was deleted or changed in it before.
     QString error;
-    if (!folder.ensure(&error)) {
+    const bool ready = isDemo ? (!parser.isSet(reset) || folder.removeProgramFiles(&error)) && folder.ensureDemo(&error)
+                              : folder.ensure(&error);
+    if (!ready) {
         splash->close();
         QMessageBox::critical(nullptr, QStringLiteral("Glacinor Q-19"),
                               QStringLiteral("The data folder %1 cannot be used:\n%2").arg(folderPath, error));
@@ -94,6 +109,15 @@ int main(int argc, char* argv[])
         line.no_computer_link = false;
         line.LoadPropertySettings();
     });
+    // The instrument the line was opened for, while it is up.
+    QString connectedId;
+    QObject::connect(&line, &ccForm1_engine::changed, &directory, [&] {
+        if (!globals.link_up)
+            connectedId.clear();
+        else if (connectedId.isEmpty())
+            connectedId = directory.openId();
+    });
+    directory.setConnectedInstrument([&] { return globals.link_up ? connectedId : QString(); });
     // No call may start while a new instrument is half typed in.
     QObject::connect(&directory, &ccForm1_directory::addingChanged, &line, [&line](bool adding) {
         line.dial_num.enabled = !adding;
@@ -125,6 +149,8 @@ int main(int argc, char* argv[])
         splash->close();
         return 1;
     }
+    if (isDemo && directory.indexOfId(DataFolder::DemoId) >= 0)
+        directory.DBCombo1_Click(directory.indexOfId(DataFolder::DemoId));
     mainWindow.setConnectionForm(new ccForm1_view(directory, line));
 
     splash->close();

@@ -7,6 +7,7 @@
 #include <QAction>
 #include <QApplication>
 #include <QCloseEvent>
+#include <QHelpEvent>
 #include <QMdiArea>
 #include <QMdiSubWindow>
 #include <QMenuBar>
@@ -38,9 +39,17 @@ MDIForm1::MDIForm1(OpenViews& views, LinkGlobals& globals, QWidget* parent)
     if (!restoreGeometry(settings.value(QStringLiteral("MainWindow/geometry")).toByteArray()))
         resize(1280, 760);
     restoreState(settings.value(QStringLiteral("MainWindow/state")).toByteArray());
+    qApp->installEventFilter(this);
 }
 
-MDIForm1::~MDIForm1() = default;
+MDIForm1::~MDIForm1()
+{
+    // The views' windows go with the area after this object's members: they
+    // must not report their unloading to an engine that has gone.
+    m_exiting = true;
+    for (QMdiSubWindow* sub : std::as_const(m_open))
+        sub->disconnect(this);
+}
 
 void MDIForm1::buildToolbar()
 {
@@ -101,8 +110,16 @@ void MDIForm1::buildMenus()
     helpMenu->setObjectName(QStringLiteral("mnuhelpmenu"));
     auto* contents = helpMenu->addAction(QStringLiteral("Glacinor Help"));
     contents->setObjectName(QStringLiteral("mnuhelp"));
-    contents->setShortcut(QKeySequence::HelpContents);
     connect(contents, &QAction::triggered, this, [this] { help()->show_help(QStringLiteral("q-19.chm")); });
+    auto* viewHelp = helpMenu->addAction(QStringLiteral("Help on this window"));
+    viewHelp->setObjectName(QStringLiteral("mnuhelpview"));
+    viewHelp->setShortcut(QKeySequence::HelpContents);
+    viewHelp->setShortcutContext(Qt::ApplicationShortcut);
+    connect(viewHelp, &QAction::triggered, this, &MDIForm1::showContextHelp);
+    auto* whatsThisItem = helpMenu->addAction(QStringLiteral("Whats this help"));
+    whatsThisItem->setObjectName(QStringLiteral("mnuwhatsthis"));
+    whatsThisItem->setShortcut(QKeySequence::WhatsThis);
+    connect(whatsThisItem, &QAction::triggered, this, &MDIForm1::whatsThis);
     auto* about = helpMenu->addAction(QStringLiteral("About Glacinor"));
     about->setObjectName(QStringLiteral("mnuabout"));
     connect(about, &QAction::triggered, this, &MDIForm1::mnuabout_Click);
@@ -145,6 +162,35 @@ HelpWindow* MDIForm1::help()
     if (!m_help)
         m_help = new HelpWindow(this);
     return m_help;
+}
+
+void MDIForm1::showContextHelp()
+{
+    QString topic = kConnectionHelpTopic;
+    const QMdiSubWindow* front = m_area->activeSubWindow();
+    for (auto it = m_open.cbegin(); it != m_open.cend(); ++it) {
+        if (it.value() == front)
+            topic = helpTopic(ViewId(it.key()));
+    }
+    help()->show_help(QStringLiteral("q-19.chm"), topic);
+}
+
+bool MDIForm1::eventFilter(QObject* watched, QEvent* event)
+{
+    if (event->type() != QEvent::WhatsThis && event->type() != QEvent::QueryWhatsThis)
+        return QMainWindow::eventFilter(watched, event);
+    auto* w = qobject_cast<QWidget*>(watched);
+    if (!w || !w->whatsThis().isEmpty() || !isAncestorOf(w))
+        return QMainWindow::eventFilter(watched, event);
+    // A control without a text of its own is explained by its tool tip; one
+    // without either passes the question on to its parent.
+    const QString text = w->toolTip();
+    if (text.isEmpty())
+        return QMainWindow::eventFilter(watched, event);
+    event->accept();
+    if (event->type() == QEvent::WhatsThis)
+        QWhatsThis::showText(static_cast<QHelpEvent*>(event)->globalPos(), text.toHtmlEscaped(), w);
+    return true;
 }
 
 bool MDIForm1::available(ViewId id) const

@@ -30,6 +30,8 @@ public:
     void setConnectionForm(QWidget* ccForm1);
     void registerView(ViewId id, ViewFactory factory);
     HelpWindow* help();
+    // F1: the help page of the view in front, or of the connection form.
+    void showContextHelp();
 
     // ViewHost
     bool available(ViewId id) const override;
@@ -46,6 +48,9 @@ public:
 
 protected:
     void closeEvent(QCloseEvent* event) override;
+    // In "Whats this" mode a click on a control shows its help: its own
+    // text, else its tool tip.
+    bool eventFilter(QObject* watched, QEvent* event) override;
 
 private:
     void buildMenus();

@@ -69,3 +69,34 @@ const QList<ViewId>& exitOrder()
                                      ViewId::statuspg, ViewId::front,  ViewId::brumalet, ViewId::multiprobes};
     return order;
 }
+
+QString helpTopic(ViewId id)
+{
+    switch (id) {
+    case ViewId::history:
+        return QStringLiteral("Temp/Press Data Logged");
+    case ViewId::alarm:
+        return QStringLiteral("Alarms");
+    case ViewId::status:
+        return QStringLiteral("Channel Status Commands");
+    case ViewId::channels:
+        return QStringLiteral("Channel Set Points");
+    case ViewId::statusp:
+        return QStringLiteral("Current Status Pressure");
+    case ViewId::power:
+        return QStringLiteral("Power Used Data Logged");
+    case ViewId::loadshed:
+        return QStringLiteral("Set Load Shedding");
+    case ViewId::statusg:
+        return QStringLiteral("Current Status Temp Graphic");
+    case ViewId::statuspg:
+        return QStringLiteral("Current Status Press Graphic");
+    case ViewId::front:
+        return QStringLiteral("Glacinor Front Panel");
+    case ViewId::brumalet:
+        return QStringLiteral("Current Brumalet's Data");
+    case ViewId::multiprobes:
+        return QStringLiteral("Multi Probes Status Commands");
+    }
+    return kConnectionHelpTopic;
+}

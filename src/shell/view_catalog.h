@@ -32,6 +32,11 @@ struct ViewInfo {
 const QList<ViewInfo>& viewCatalog();
 const ViewInfo& viewInfo(ViewId id);
 
+// The help topic of a view: the page that F1 opens while it is in front.
+QString helpTopic(ViewId id);
+// The page of the connection form.
+inline const QString kConnectionHelpTopic = QStringLiteral("Connection Window");
+
 // The toolbar in its order: key and tool tip.
 struct ToolInfo {
     const char* key;

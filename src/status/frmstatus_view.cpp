@@ -3,6 +3,7 @@
 #include "platform/widget_control_state.h"
 #include "platform/widget_printer.h"
 #include "status/frmstatus_engine.h"
+#include "status/status_cycle.h"
 
 #include <QGridLayout>
 #include <QGroupBox>
@@ -18,6 +19,24 @@
 void StatusViewBase::bind(const ControlState& state, QWidget* w, bool data)
 {
     m_bindings.append({&state, w, data});
+}
+
+void StatusViewBase::bindInterval(StatusCycle& cycle, QSpinBox* spinner)
+{
+    m_cycle = &cycle;
+    m_interval = spinner;
+    spinner->setRange(StatusCycle::IntervalMin, StatusCycle::SpinnerMax);
+    bind(cycle.UpDown1, spinner);
+    connect(spinner, &QSpinBox::valueChanged, this, [this](int value) {
+        if (!m_refreshing && m_cycle->UpDown1.value.toInt() != value)
+            m_cycle->UpDown1_Change(value);
+    });
+}
+
+void StatusViewBase::unitTip(QWidget* w, const QString& tip)
+{
+    m_unitTips.append({w, tip});
+    w->setToolTip(tip);
 }
 
 void StatusViewBase::scheduleRefresh()
@@ -37,6 +56,11 @@ void StatusViewBase::refresh()
 {
     const bool old = stale();
     const QString age = old ? ageText() : QString();
+    // Showing the engine's state is no step of the operator's: nothing the
+    // widgets signal meanwhile may be written back.
+    m_refreshing = true;
+    if (m_interval)
+        m_interval->setMaximum(qMax(int(StatusCycle::SpinnerMax), m_cycle->UpDown1.value.toInt()));
     for (const Binding& b : m_bindings) {
         applyControlState(*b.state, b.widget);
         if (b.data && old) {
@@ -44,6 +68,12 @@ void StatusViewBase::refresh()
             b.widget->setToolTip(age);
         }
     }
+    for (const auto& [w, tip] : std::as_const(m_unitTips)) {
+        const QString now = w->toolTip();
+        if (!now.startsWith(tip))
+            w->setToolTip(now.isEmpty() ? tip : tip + QLatin1Char('\n') + now);
+    }
+    m_refreshing = false;
     afterRefresh();
 }
 
@@ -101,7 +131,6 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     time->setMinimumWidth(time->fontMetrics().horizontalAdvance(QStringLiteral("00/00/0000 00:00:00")) + 16);
     auto* interval = new QSpinBox(page);
     interval->setObjectName(QStringLiteral("UpDown1"));
-    interval->setRange(StatusCycle::IntervalMin, StatusCycle::SpinnerMax);
     interval->setSuffix(QStringLiteral(" s"));
     auto* intervalText = box(QStringLiteral("Text10_1"), page);
     intervalText->hide(); // the spinner shows the same number
@@ -134,7 +163,7 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     bind(c.Text10[0], id);
     bind(c.Text10[1], intervalText);
     bind(c.Text10[2], time);
-    bind(c.UpDown1, interval);
+    bindInterval(c, interval);
     bind(c.nowstatus, now);
     bind(c.startstatus, start);
     bind(c.stopstatus, stop);
@@ -146,12 +175,14 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     auto* grid = new QGridLayout(rowsBox);
     grid->setHorizontalSpacing(6);
     grid->setVerticalSpacing(2);
-    const QStringList heads = {QStringLiteral("Channel"), QStringLiteral("Temp"), QStringLiteral("Bank"),
-                               QStringLiteral("Assoc 1"), QStringLiteral("Assoc 2"), QStringLiteral("Assoc 3"),
-                               QStringLiteral("Outputs"), QString(), QString(), QString(), QStringLiteral("PID"),
-                               QStringLiteral("Alarm")};
+    // The replies carry no units: the heads say them.
+    const QStringList heads = {QStringLiteral("Channel"),    QStringLiteral("Temp °C"),    QStringLiteral("Bank"),
+                               QStringLiteral("Assoc 1 °C"), QStringLiteral("Assoc 2 °C"), QStringLiteral("Assoc 3 °C"),
+                               QStringLiteral("Outputs"),    QString(),                    QString(),
+                               QString(),                    QStringLiteral("PID %"),      QStringLiteral("Alarm")};
     for (int col = 0; col < heads.size(); ++col) {
         auto* h = new QLabel(heads[col], rowsBox);
+        h->setObjectName(indexed("head", col));
         QFont f = h->font();
         f.setBold(true);
         h->setFont(f);
@@ -206,13 +237,19 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
 
     // Suction pressures and the pressure inputs of the banks.
     auto* plant = new QHBoxLayout;
-    auto* sucBox = new QGroupBox(QStringLiteral("Suction Pressures"), page);
+    auto* sucBox = new QGroupBox(QStringLiteral("Suction Pressures KPA"), page);
     auto* sucGrid = new QGridLayout(sucBox);
     for (int i = 0; i < frmstatus_engine::Suctions; ++i) {
+        auto* l = new QLabel(QStringLiteral("Suc %1").arg(i + 1), sucBox);
+        l->setObjectName(indexed("sucLabel", i));
+        l->setAlignment(Qt::AlignCenter);
         auto* s = box(indexed("suc", i), sucBox);
         s->setMinimumWidth(48);
-        sucGrid->addWidget(s, 0, i);
+        unitTip(s, QStringLiteral("Suction pressure %1, in KPA").arg(i + 1));
+        sucGrid->addWidget(l, 0, i);
+        sucGrid->addWidget(s, 1, i);
         bind(e.suc[i], s, true);
+        m_sucLabels.append(std::pair<QWidget*, QWidget*>(l, s));
     }
     auto* pBox = new QGroupBox(QStringLiteral("Pressures"), page);
     auto* pGrid = new QGridLayout(pBox);
@@ -271,10 +308,6 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     connect(print, &QPushButton::clicked, this, [this] {
         printPreview(this, m_e.printgraph.text, [this](Printer& p) { m_e.printgraph_Click(p); });
     });
-    connect(interval, &QSpinBox::valueChanged, this, [this](int value) {
-        if (m_e.cycle.UpDown1.value.toInt() != value)
-            m_e.cycle.UpDown1_Change(value);
-    });
     connect(clear, &QPushButton::clicked, &e, &frmstatus_engine::Command2_Click);
     connect(numbers, &QPushButton::clicked, &e, &frmstatus_engine::Cmdselchan_Click);
     connect(descriptions, &QPushButton::clicked, &e, &frmstatus_engine::Cmdseldis_Click);
@@ -296,6 +329,9 @@ QString frmstatus_view::ageText() const
 
 void frmstatus_view::afterRefresh()
 {
+    // A suction label goes with its box.
+    for (const auto& [label, value] : std::as_const(m_sucLabels))
+        label->setVisible(!value->isHidden());
     // A hidden frame hides its whole row.
     for (int i = 0; i < m_rows.size(); ++i) {
         if (!m_e.chanframe[i].visible) {

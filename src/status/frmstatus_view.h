@@ -5,7 +5,9 @@
 #include <QWidget>
 
 class frmstatus_engine;
+class QSpinBox;
 class QTimer;
+class StatusCycle;
 struct ControlState;
 
 // Status views' shared drawing: the engine's controls applied to widgets of
@@ -18,6 +20,13 @@ public:
 protected:
     // Widgets are found by objectName, the control's name.
     void bind(const ControlState& state, QWidget* w, bool data = false);
+    // The interval spinner: only the operator's steps reach the cycle (and
+    // its store); a stored interval above the spinner's own limit is shown
+    // as it is, never cut.
+    void bindInterval(StatusCycle& cycle, QSpinBox* spinner);
+    // A tool tip with the unit of a data box, kept ahead of what the engine
+    // or the stale state puts there.
+    void unitTip(QWidget* w, const QString& tip);
     void scheduleRefresh();
     void refresh();
     // The stale state as the cycle tells it: dims the data widgets.
@@ -33,7 +42,11 @@ private:
         bool data;
     };
     QList<Binding> m_bindings;
+    QList<std::pair<QWidget*, QString>> m_unitTips;
     QTimer* m_timer = nullptr;
+    StatusCycle* m_cycle = nullptr;
+    QSpinBox* m_interval = nullptr;
+    bool m_refreshing = false;
 };
 
 // frmstatus: the temperature status of the selected channels on one tab,
@@ -53,4 +66,5 @@ protected:
 private:
     frmstatus_engine& m_e;
     QList<QList<QWidget*>> m_rows;
+    QList<std::pair<QWidget*, QWidget*>> m_sucLabels; // label, box
 };

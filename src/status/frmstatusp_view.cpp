@@ -62,7 +62,6 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     time->setFont(tf);
     auto* interval = new QSpinBox(this);
     interval->setObjectName(QStringLiteral("UpDown1"));
-    interval->setRange(StatusCycle::IntervalMin, StatusCycle::SpinnerMax);
     interval->setSuffix(QStringLiteral(" s"));
     auto* now = new QPushButton(this);
     now->setObjectName(QStringLiteral("nowstatus"));
@@ -96,7 +95,7 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     v->addWidget(ceased2);
     bind(c.Text10[0], id);
     bind(c.Text10[2], time);
-    bind(c.UpDown1, interval);
+    bindInterval(c, interval);
     bind(c.nowstatus, now);
     bind(c.startstatus, start);
     bind(c.stopstatus, stop);
@@ -108,10 +107,18 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     // Banks.
     auto* banks = new QGroupBox(QStringLiteral("Banks"), this);
     auto* bg = new QGridLayout(banks);
-    const QStringList rows = {QStringLiteral("Temperature"), QStringLiteral("Suction"), QStringLiteral("Discharge"),
-                              QStringLiteral("Liquid"), QStringLiteral("Liquid Pump")};
-    for (int r = 0; r < rows.size(); ++r)
-        bg->addWidget(head(rows[r], banks), r + 1, 0, Qt::AlignLeft);
+    // The replies carry no units: the heads say them.
+    const QStringList rows = {QStringLiteral("Temperature °C"), QStringLiteral("Suction KPA"),
+                              QStringLiteral("Discharge KPA"), QStringLiteral("Liquid KPA"), QStringLiteral("Liquid Pump")};
+    const QStringList tips = {QStringLiteral("Temperature of bank %1, in °C"),
+                              QStringLiteral("Suction pressure of bank %1, in KPA"),
+                              QStringLiteral("Discharge pressure of bank %1, in KPA"),
+                              QStringLiteral("Liquid pressure of bank %1, in KPA"), QString()};
+    for (int r = 0; r < rows.size(); ++r) {
+        QLabel* h = head(rows[r], banks);
+        h->setObjectName(indexed("bankHead", r));
+        bg->addWidget(h, r + 1, 0, Qt::AlignLeft);
+    }
     for (int b = 0; b < frmstatusp_engine::Banks; ++b) {
         auto* l = new QLabel(banks);
         l->setObjectName(indexed("Label2", b));
@@ -123,11 +130,14 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
         for (int r = 0; r < 5; ++r) {
             auto* w = box(indexed(names[r], b), banks, true);
             w->setMinimumWidth(70);
+            if (!tips[r].isEmpty())
+                unitTip(w, tips[r].arg(b + 1));
             bg->addWidget(w, r + 1, b + 1);
             bind(*states[r], w, true);
         }
     }
-    auto* levelBox = new QGroupBox(QStringLiteral("Liquid Level"), this);
+    auto* levelBox = new QGroupBox(QStringLiteral("Liquid Level %"), this);
+    levelBox->setObjectName(QStringLiteral("levelBox"));
     auto* lv = new QVBoxLayout(levelBox);
     auto* level = box(QStringLiteral("liquidlevel_0"), levelBox, true);
     lv->addWidget(level);
@@ -147,9 +157,12 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     cg->setVerticalSpacing(1);
     const QStringList compHeads = {QStringLiteral("Compressor"), QStringLiteral("Bank"), QStringLiteral("Equal'z"),
                                    QStringLiteral("Stages"), QString(), QString(), QString(), QString(), QString(),
-                                   QString(), QString(), QStringLiteral("Run Hours")};
-    for (int col = 0; col < compHeads.size(); ++col)
-        cg->addWidget(head(compHeads[col], comp), 0, col);
+                                   QString(), QString(), QStringLiteral("Run Hours H")};
+    for (int col = 0; col < compHeads.size(); ++col) {
+        QLabel* h = head(compHeads[col], comp);
+        h->setObjectName(indexed("compHead", col));
+        cg->addWidget(h, 0, col);
+    }
     for (int i = 0; i < frmstatusp_engine::Compressors; ++i) {
         QList<QWidget*> row = {box(indexed("chanframe", i), comp, true), box(indexed("bank", i), comp),
                                box(indexed("equal", i), comp)};
@@ -179,7 +192,7 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     auto* kg = new QGridLayout(cond);
     kg->setVerticalSpacing(1);
     const QStringList condHeads = {QStringLiteral("Condenser"), QStringLiteral("Bank"), QStringLiteral("Stages"),
-                                   QString(), QString(), QString(), QStringLiteral("Run Hours")};
+                                   QString(), QString(), QString(), QStringLiteral("Run Hours H")};
     for (int col = 0; col < condHeads.size(); ++col)
         kg->addWidget(head(condHeads[col], cond), 0, col);
     for (int c2 = 0; c2 < frmstatusp_engine::Condensers; ++c2) {
@@ -259,10 +272,6 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
         printPreview(this, m_e.printgraph.text, [this](Printer& p) { m_e.printgraph_Click(p); });
     });
     connect(panel, &QPushButton::clicked, &e, &frmstatusp_engine::dbaseload_Click);
-    connect(interval, &QSpinBox::valueChanged, this, [this](int value) {
-        if (m_e.cycle.UpDown1.value.toInt() != value)
-            m_e.cycle.UpDown1_Change(value);
-    });
     connect(&e, &frmstatusp_engine::changed, this, &frmstatusp_view::scheduleRefresh);
     refresh();
 }

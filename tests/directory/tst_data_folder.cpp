@@ -1,6 +1,8 @@
 #include "directory/data_folder.h"
 #include "setpoints/instrument_store.h"
+#include "setpoints/channel_record_codec.h"
 #include "setpoints/instrument_schema.h"
+#include "sim/sim_state.h"
 
 #include <QtTest>
 
@@ -10,6 +12,9 @@ private slots:
     void craftedIdsNameNoFile_data();
     void craftedIdsNameNoFile();
     void firstStartCreatesFolderWithDemoInstrument();
+    void demoStoreHoldsSimulatorSetpoints();
+    void demoComesBack_data();
+    void demoComesBack();
     void locationFromOptionOrXdg_data();
     void locationFromOptionOrXdg();
 };
@@ -102,6 +107,99 @@ void TestDataFolder::firstStartCreatesFolderWithDemoInstrument()
     QCOMPARE(InstrumentStore::open(folder.instrumentFile("1"))->info(kInfoPortRow, kInfoConnectionColumn).toString(),
              "/dev/ttyUSB0");
     QVERIFY(QFileInfo::exists(folder.layoutTemplate(4)));
+}
+
+// The demo's first start: its store holds what the simulator behind it holds,
+// so the views show compressors and descriptions before any upload.
+void TestDataFolder::demoStoreHoldsSimulatorSetpoints()
+{
+    QTemporaryDir tmp;
+    DataFolder folder(tmp.path());
+    QString error;
+    QVERIFY2(folder.ensure(&error), qPrintable(error));
+    auto store = InstrumentStore::open(folder.instrumentFile("1"), &error);
+    QVERIFY2(store, qPrintable(error));
+    sim::Options options;
+    options.historyHours = 0;
+    const sim::InstrumentState instrument(options);
+    int compared = 0;
+    for (int wire = 0; wire < sim::Channels; ++wire) {
+        QCOMPARE(store->setpoint(wire, sim::DescriptionField).toString(),
+                 QString::fromLatin1(instrument.description(wire)));
+        for (int field : channel_record::downloadFields(wire, instrument.versionNumber())) {
+            if (field == sim::DescriptionField)
+                continue;
+            QVERIFY2(store->setpoint(wire, field).toDouble() == instrument.field(wire, field),
+                     qPrintable(QStringLiteral("channel %1 field %2").arg(wire + 1).arg(field)));
+            ++compared;
+        }
+    }
+    QVERIFY2(compared > 216 * 20, qPrintable(QString::number(compared)));
+    // Some of the plant is configured: a store of template values would not show it.
+    QVERIFY(store->setpoint(0, 83).toInt() >= 1);
+}
+
+void TestDataFolder::demoComesBack_data()
+{
+    QTest::addColumn<QString>("damage");
+    QTest::newRow("data base deleted") << "db";
+    QTest::newRow("row deleted") << "row";
+    QTest::newRow("row and files deleted") << "row+db";
+    QTest::newRow("line changed") << "port";
+    QTest::newRow("reset") << "reset";
+}
+
+// q19 --demo always finds its instrument on the built-in simulator; the
+// operator's other instrument stays unless the demo is reset.
+void TestDataFolder::demoComesBack()
+{
+    QFETCH(QString, damage);
+    QTemporaryDir tmp;
+    DataFolder folder(tmp.path());
+    QString error;
+    QVERIFY2(folder.ensureDemo(&error), qPrintable(error));
+    {
+        auto dir = Store::open(folder.directoryFile());
+        auto rows = dir->openRecordset(Table1::TableName);
+        QVERIFY(rows->AddNew() && rows->setValue(Table1::ID, 2) && rows->setValue(Table1::Name, "Other")
+                && rows->Update());
+        if (damage.startsWith("row")) {
+            QVERIFY(rows->MoveFirst());
+            while (rows->value(Table1::ID).toString() != "1")
+                QVERIFY(rows->MoveNext());
+            QVERIFY(rows->Delete());
+        }
+    }
+    QVERIFY(DataFolder::copyReplacing(folder.templateFile(), folder.instrumentFile("2")));
+    QFile foreign(tmp.filePath("notes.txt"));
+    QVERIFY(foreign.open(QIODevice::WriteOnly));
+    foreign.close();
+    if (damage.endsWith("db"))
+        QVERIFY(DataFolder::removeDataBase(folder.instrumentFile("1")));
+    if (damage == "port")
+        QVERIFY(InstrumentStore::open(folder.instrumentFile("1"))->setInfo(kInfoPortRow, kInfoConnectionColumn,
+                                                                          "/dev/ttyS0"));
+    if (damage == "reset")
+        QVERIFY2(folder.removeProgramFiles(&error), qPrintable(error));
+
+    QVERIFY2(folder.ensureDemo(&error), qPrintable(error));
+    QStringList ids;
+    {
+        auto dir = Store::open(folder.directoryFile());
+        auto rows = dir->openRecordset(Table1::TableName);
+        for (int i = 0; i < rows->RecordCount(); ++i) {
+            rows->setAbsolutePosition(i);
+            ids << rows->value(Table1::ID).toString();
+        }
+    }
+    ids.sort();
+    QCOMPARE(ids, damage == "reset" ? QStringList({"1"}) : QStringList({"1", "2"}));
+    QCOMPARE(QFileInfo::exists(folder.instrumentFile("2")), damage != "reset");
+    QVERIFY(foreign.exists());
+    auto demo = InstrumentStore::open(folder.instrumentFile("1"), &error);
+    QVERIFY2(demo, qPrintable(error));
+    QCOMPARE(demo->info(kInfoPortRow, kInfoConnectionColumn).toString(), "Simulator (built-in)");
+    QVERIFY(demo->setpoint(0, 83).toInt() >= 1);
 }
 
 void TestDataFolder::locationFromOptionOrXdg_data()

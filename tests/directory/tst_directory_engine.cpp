@@ -163,6 +163,10 @@ void TestDirectoryEngine::addUpdateRefusalsAndFiles_data()
     QTest::newRow("text id") << "abc" << "Text" << "Q-19: Unexpected Error: The Glacinor ID must be a number from 1 to 99999";
     QTest::newRow("path id") << "../x" << "Path" << "Q-19: Unexpected Error: The Glacinor ID must be a number from 1 to 99999";
     QTest::newRow("six digits") << "123456" << "Big" << "Q-19: Unexpected Error: The Glacinor ID must be a number from 1 to 99999";
+    const QString noName = "Mandatory: You must enter a \"Name\" / for the Glacinor. Re enter the correct data";
+    QTest::newRow("empty name") << "14" << "" << noName;
+    QTest::newRow("blank name") << "14" << "   " << noName;
+    QTest::newRow("same name with blanks") << "7" << " Demo Cold Store " << duplicate;
 }
 
 void TestDirectoryEngine::addUpdateRefusalsAndFiles()
@@ -244,9 +248,13 @@ void TestDirectoryEngine::deleteRemovesRowAndOnlyItsFiles_data()
     QTest::addColumn<int>("answer");
     QTest::addColumn<bool>("onlyOneRow");
     QTest::addColumn<QStringList>("titles");
-    QTest::newRow("yes") << int(Answer::Yes) << false << QStringList({"Delete Glacinor"});
-    QTest::newRow("no") << int(Answer::No) << false << QStringList({"Delete Glacinor"});
-    QTest::newRow("last row") << int(Answer::Yes) << true << QStringList({"Delete Glacinor", "Can't Delete"});
+    QTest::addColumn<QString>("connected"); // the instrument the line is up to
+    QTest::newRow("yes") << int(Answer::Yes) << false << QStringList({"Delete Glacinor"}) << QString();
+    QTest::newRow("no") << int(Answer::No) << false << QStringList({"Delete Glacinor"}) << QString();
+    QTest::newRow("last row") << int(Answer::Yes) << true << QStringList({"Delete Glacinor", "Can't Delete"})
+                              << QString();
+    QTest::newRow("connected to it") << int(Answer::Yes) << false << QStringList({"Can't Delete"}) << "1";
+    QTest::newRow("connected to another") << int(Answer::Yes) << false << QStringList({"Delete Glacinor"}) << "11";
 }
 
 void TestDirectoryEngine::deleteRemovesRowAndOnlyItsFiles()
@@ -254,8 +262,10 @@ void TestDirectoryEngine::deleteRemovesRowAndOnlyItsFiles()
     QFETCH(int, answer);
     QFETCH(bool, onlyOneRow);
     QFETCH(QStringList, titles);
+    QFETCH(QString, connected);
     Fixture f;
     QVERIFY(f.load());
+    f.form->setConnectedInstrument([connected] { return connected; });
     if (!onlyOneRow)
         QVERIFY(f.add("11", "Eleven"));
     QSignalSpy reload(f.form.get(), &ccForm1_directory::propertySettingsWanted);
@@ -265,10 +275,12 @@ void TestDirectoryEngine::deleteRemovesRowAndOnlyItsFiles()
     f.op.queueAnswer(Answer(answer));
     const bool deleted = f.form->Command2_Click();
     QCOMPARE(f.op.titles(), titles);
-    QCOMPARE(f.op.messages().first().lines,
-             QStringList({"Are you sure, this will permanatly delete this record and data base for this Glacinor",
-                          "and delete the associated control and log file"}));
-    QCOMPARE(deleted, answer == int(Answer::Yes) && !onlyOneRow);
+    const bool isConnected = connected == "1";
+    if (!isConnected)
+        QCOMPARE(f.op.messages().first().lines,
+                 QStringList({"Are you sure, this will permanatly delete this record and data base for this Glacinor",
+                              "and delete the associated control and log file"}));
+    QCOMPARE(deleted, answer == int(Answer::Yes) && !onlyOneRow && !isConnected);
     if (onlyOneRow)
         QCOMPARE(f.op.last().lines, QStringList({"There is only one record left,",
                                                  "You must add a new one then delete the one not required."}));

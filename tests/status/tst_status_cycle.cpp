@@ -288,6 +288,7 @@ void tst_status_cycle::storedInterval_data()
     QTest::addColumn<QString>("after");
     QTest::newRow("9 is replaced") << QVariant(9) << "10" << "10";
     QTest::newRow("121 is replaced") << QVariant(121) << "10" << "10";
+    QTest::newRow("31 is kept beyond the spinner") << QVariant(31) << "31" << "31";
     QTest::newRow("120 is kept beyond the spinner") << QVariant(120) << "120" << "120";
     QTest::newRow("empty is replaced") << QVariant() << "10" << "10";
 }
