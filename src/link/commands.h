@@ -55,7 +55,8 @@ QByteArray modemEscape();          // "+++", no line end
 QByteArray modemAskModulation();   // "AT+MS?" CR LF
 QByteArray modemCommand(const QString& text); // "AT" + text, CR LF
 
-// Tokens in the order the dispatcher (reply_do) looks for them.
+// Tokens that end the replies; the dispatcher's table (reply_do) gives the
+// order in which they are looked for.
 enum class Token {
     NoDialtone, Busy, NoCarrier, Connect, Glacinor, Sret, Schanupload, Downcheck,
     Donedown, Reset, Dlres, Histy, Plres, Power, Status, Presss, Torvan, Realarms,
