@@ -42,6 +42,13 @@ public:
     // dials (Text1(7)) and its info table, or null when there is none.
     void setInstrument(const QString& id, const QString& phone, Recordset* info);
     QString instrumentId() const { return m_Text1_0; }
+    // The directory opened an instrument: its port settings, and no refusal
+    // of an instrument before it stands in the way of the next connect.
+    void instrumentOpened();
+    // No call may start while a new instrument is half typed in.
+    void setDialAllowed(bool allowed);
+    // The operator chose the modem connection type.
+    bool modemSelected() const { return Option2[0].value.toBool(); }
 
     // --- Link ---
     bool Output(const QByteArray& bytes) override;
@@ -171,6 +178,7 @@ private:
     void setPortState(ControlState& box, bool open);
     void applyConnectionType(int index);
     void selectPort(const QString& name);
+    QString storedPort();
     QString composedSettings() const;
     QVariant infoCell(int row) const;
     void setInfoCell(int row, const QVariant& value);

@@ -97,6 +97,27 @@ QString ccForm1_engine::composedSettings() const
         + cboDataBits.text.trimmed() + QLatin1Char(',') + cboStopBits.text.trimmed();
 }
 
+// Row 3: the port. A bare number is the port number of older files; an
+// empty row gets port 1, the first this machine has.
+QString ccForm1_engine::storedPort()
+{
+    QString port = infoCell(RowPort).toString().trimmed();
+    bool numeric = false;
+    const int number = port.toInt(&numeric);
+    if (numeric && number > 0) {
+#ifdef Q_OS_WIN
+        port = QStringLiteral("COM%1").arg(number);
+#else
+        port = QStringLiteral("/dev/ttyS%1").arg(number - 1);
+#endif
+    }
+    if (port.isEmpty()) {
+        port = cboPortItems.isEmpty() ? QStringLiteral("/dev/ttyS0") : cboPortItems.first().name;
+        setInfoCell(RowPort, port);
+    }
+    return port;
+}
+
 void ccForm1_engine::LoadPropertySettings()
 {
     const auto p = m_notify.procedure();
@@ -141,22 +162,7 @@ void ccForm1_engine::LoadPropertySettings()
     for (int i = 0; i < 4; ++i)
         optFlow[i].value = i == flow;
 
-    // Row 3: the port. A bare number is the port number of older files.
-    QString port = infoCell(RowPort).toString().trimmed();
-    bool numeric = false;
-    const int number = port.toInt(&numeric);
-    if (numeric && number > 0) {
-#ifdef Q_OS_WIN
-        port = QStringLiteral("COM%1").arg(number);
-#else
-        port = QStringLiteral("/dev/ttyS%1").arg(number - 1);
-#endif
-    }
-    if (port.isEmpty()) {
-        // Port 1: the first this machine has.
-        port = cboPortItems.isEmpty() ? QStringLiteral("/dev/ttyS0") : cboPortItems.first().name;
-        setInfoCell(RowPort, port);
-    }
+    const QString port = storedPort();
     selectPort(port);
     setCommPort(port);
     m_line->setSettings(*ls);
@@ -179,6 +185,19 @@ void ccForm1_engine::LoadPropertySettings()
     modem.text = infoCell(RowModem).toString();
 
     cboSpeed_Click(speedIndex);
+}
+
+void ccForm1_engine::instrumentOpened()
+{
+    const auto p = m_notify.procedure();
+    no_computer_link = false;
+    LoadPropertySettings();
+}
+
+void ccForm1_engine::setDialAllowed(bool allowed)
+{
+    const auto p = m_notify.procedure();
+    dial_num.enabled = allowed;
 }
 
 void ccForm1_engine::cboSpeed_Click(int listIndex)
