@@ -134,18 +134,12 @@ struct Rig {
     }
     void open(int mask)
     {
-        table.history_open = mask & History;
-        table.alarm_open = mask & Alarm;
-        table.status_open = mask & Status;
-        table.channels_open = mask & Channels;
-        table.statusp_open = mask & StatusP;
-        table.power_open = mask & Power;
-        table.loadshed_open = mask & LoadShed;
-        table.statusg_open = mask & StatusG;
-        table.statuspg_open = mask & StatusPG;
-        table.front_open = mask & Front;
-        table.brumalet_open = mask & Brumalet;
-        table.multiprobes_open = mask & MultiProbes;
+        bool OpenViews::*flags[] = {&OpenViews::history_open, &OpenViews::alarm_open, &OpenViews::status_open,
+            &OpenViews::channels_open, &OpenViews::statusp_open, &OpenViews::power_open, &OpenViews::loadshed_open,
+            &OpenViews::statusg_open, &OpenViews::statuspg_open, &OpenViews::front_open, &OpenViews::brumalet_open,
+            &OpenViews::multiprobes_open};
+        for (int bit = 0; bit < 12; ++bit)
+            table.*flags[bit] = mask & (1 << bit);
     }
     // A modem call that the modem has answered with CONNECT.
     void dialAndConnect()
