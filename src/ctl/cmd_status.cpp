@@ -116,7 +116,7 @@ int pressure(const CtlOptions& o)
     // after each reply.
     const bool torvanels = c.globals.versionNumber() >= presss_layout::TorvanelRequestVersion;
     if (torvanels) {
-        c.engine().Output(commands::framed(commands::Sender::StatusP, "t"));
+        c.engine().Output(commands::torvanelRequest());
         if (!c.waitFor([&] { return !catcher.torvan.isEmpty(); }, wait))
             return noResponse(c.op);
     }

@@ -3,7 +3,7 @@
 #include "directory/data_folder.h"
 #include "directory/directory_engine.h"
 #include "platform/tcp_line.h"
-#include "shell/builtin_simulator_line.h"
+#include "platform/line_factory.h"
 
 #include <QEventLoop>
 #include <QFileInfo>
@@ -98,7 +98,7 @@ int Connection::open(const QString& command)
 
     // A data folder made by the workstation's demo names the built-in simulator as its port.
     auto lineFactory = [this](const QString& port) {
-        return makeWorkstationLine(port, [this] { return m_engine && m_engine->Option2[0].value.toBool(); });
+        return makeWorkstationLine(port, [this] { return m_engine && m_engine->modemSelected(); });
     };
     m_engine = std::make_unique<ccForm1_engine>(clock, op, m_settings, views, globals, lineFactory);
     ccForm1_engine& engine = *m_engine;
@@ -114,7 +114,7 @@ int Connection::open(const QString& command)
             return Failure;
         }
     }
-    const bool modem = engine.Option2[0].value.toBool();
+    const bool modem = engine.modemSelected();
     if (modem && m_phone.isEmpty()) {
         std::fprintf(stderr, "q19ctl: instrument %s has no modem number in the directory\n",
                      m_id.toLocal8Bit().constData());

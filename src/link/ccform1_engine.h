@@ -1,10 +1,12 @@
 #pragma once
 
+#include "link/commands.h"
 #include "link/link.h"
 #include "link/link_globals.h"
 #include "link/open_views.h"
 #include "platform/clock.h"
 #include "platform/control_state.h"
+#include "platform/change_notifier.h"
 #include "platform/line.h"
 #include "platform/operator.h"
 #include "platform/settings.h"
@@ -40,6 +42,13 @@ public:
     // dials (Text1(7)) and its info table, or null when there is none.
     void setInstrument(const QString& id, const QString& phone, Recordset* info);
     QString instrumentId() const { return m_Text1_0; }
+    // The directory opened an instrument: its port settings, and no refusal
+    // of an instrument before it stands in the way of the next connect.
+    void instrumentOpened();
+    // No call may start while a new instrument is half typed in.
+    void setDialAllowed(bool allowed);
+    // The operator chose the modem connection type.
+    bool modemSelected() const { return Option2[0].value.toBool(); }
 
     // --- Link ---
     bool Output(const QByteArray& bytes) override;
@@ -90,7 +99,10 @@ public:
     void MSComm1_OnComm(int commEvent, const QByteArray& input = {});
     // Appends arrived text to the box through the line filter.
     void show_received(QString& box, QString data);
+    // Hands test3 to the first entry of dispatchOrder() whose token it holds.
     void reply_do();
+    // The tokens reply_do looks for, first to last.
+    static QList<commands::Token> dispatchOrder();
 
     // --- controls the logic reads or writes ---
     ControlState cboPort, cboSpeed, cboParity, cboDataBits, cboStopBits, optFlow[4], cmdOK;
@@ -145,8 +157,14 @@ signals:
     void identityAccepted();
 
 private:
-    class Procedure;
-    friend class Procedure;
+    // One entry of the dispatch table: the token, a guard (null: always),
+    // and the handler, which says whether test3 is emptied behind it.
+    struct Route {
+        commands::Token token;
+        bool (*when)(const ccForm1_engine&);
+        bool (*run)(ccForm1_engine&);
+    };
+    static const QList<Route> s_routes;
 
     void connectLine();
     bool openPort(QString* error);
@@ -160,6 +178,7 @@ private:
     void setPortState(ControlState& box, bool open);
     void applyConnectionType(int index);
     void selectPort(const QString& name);
+    QString storedPort();
     QString composedSettings() const;
     QVariant infoCell(int row) const;
     void setInfoCell(int row, const QVariant& value);
@@ -195,5 +214,5 @@ private:
     QString m_Text1_7;
     Recordset* m_info = nullptr;
     bool m_option2Busy = false;
-    int m_depth = 0;
+    ChangeNotifier m_notify{[this] { emit changed(); }};
 };

@@ -1,7 +1,6 @@
 #include "link/ccform1_line_view.h"
 
 #include "link/ccform1_engine.h"
-#include "platform/widget_control_state.h"
 
 #include <QButtonGroup>
 #include <QComboBox>
@@ -38,30 +37,58 @@ ccForm1_line_view::ccForm1_line_view(ccForm1_engine& engine, QWidget* parent)
     : QWidget(parent), m_engine(engine)
 {
     setObjectName(QStringLiteral("ccForm1_line"));
-    build();
-    connect(&m_engine, &ccForm1_engine::changed, this, &ccForm1_line_view::refresh);
+    auto* left = new QVBoxLayout;
+    left->addWidget(buildSettings());
+    left->addStretch();
+    auto* right = new QVBoxLayout;
+    buildConnection(right);
+    right->addWidget(buildState());
+    right->addStretch();
+    auto* columns = new QHBoxLayout;
+    columns->addLayout(left, 1);
+    columns->addLayout(right, 1);
+    auto* top = new QVBoxLayout(this);
+    top->addLayout(columns, 1);
+    top->addLayout(buildStatusRow());
+
+    m_binder.setAfterRefresh([this] {
+        // A list filled anew has lost its selection: show the states again.
+        if (fillLists()) {
+            m_binder.refresh();
+            return;
+        }
+        // An editable box shows the port's name, also one typed and not listed.
+        if (m_cboPort->currentText() != m_engine.cboPort.text && !m_cboPort->lineEdit()->hasFocus())
+            m_cboPort->setEditText(m_engine.cboPort.text);
+    });
+    connect(&m_engine, &ccForm1_engine::changed, &m_binder, &WidgetBinder::scheduleRefresh);
+    fillLists();
     refresh();
 }
 
-void ccForm1_line_view::build()
+void ccForm1_line_view::refresh() { m_binder.refresh(); }
+
+QPushButton* ccForm1_line_view::button(ControlState& state, const char* name, void (ccForm1_engine::*click)())
+{
+    auto* b = new QPushButton(state.text);
+    b->setObjectName(QLatin1String(name));
+    connect(b, &QPushButton::clicked, &m_engine, click);
+    m_binder.bind(state, b);
+    return b;
+}
+
+QGroupBox* ccForm1_line_view::group(ControlState& state, const char* name)
+{
+    auto* g = new QGroupBox(state.text);
+    g->setObjectName(QLatin1String(name));
+    m_binder.bind(state, g);
+    return g;
+}
+
+QWidget* ccForm1_line_view::buildSettings()
 {
     ccForm1_engine& e = m_engine;
-    auto bind = [this](const ControlState& state, QWidget* w) { m_bound.append({&state, w}); };
-    auto button = [&](ControlState& state, const char* name, void (ccForm1_engine::*click)()) {
-        auto* b = new QPushButton(state.text);
-        b->setObjectName(QLatin1String(name));
-        connect(b, &QPushButton::clicked, &e, click);
-        bind(state, b);
-        return b;
-    };
-    auto group = [&](ControlState& state, const char* name) {
-        auto* g = new QGroupBox(state.text);
-        g->setObjectName(QLatin1String(name));
-        bind(state, g);
-        return g;
-    };
-
-    // Port settings.
+    const auto bind = [this](const ControlState& state, QWidget* w) { m_binder.bind(state, w); };
     QGroupBox* fraConnection = group(e.fraConnection, "fraConnection");
     auto* settingsForm = new QFormLayout(fraConnection);
     m_cboPort = new QComboBox;
@@ -103,7 +130,13 @@ void ccForm1_line_view::build()
     }
     settingsForm->addRow(flowBox);
     settingsForm->addRow(button(e.cmdOK, "cmdOK", &ccForm1_engine::cmdOK_Click));
+    return fraConnection;
+}
 
+void ccForm1_line_view::buildConnection(QVBoxLayout* column)
+{
+    ccForm1_engine& e = m_engine;
+    const auto bind = [this](const ControlState& state, QWidget* w) { m_binder.bind(state, w); };
     // Connection type. The options are not exclusive by themselves: the
     // engine decides, and may refuse the change.
     QGroupBox* frame4 = group(e.Frame4, "Frame4");
@@ -113,6 +146,7 @@ void ccForm1_line_view::build()
         r->setObjectName(arrayName("Option2", i));
         r->setAutoExclusive(false);
         bind(e.Option2[i], r);
+        // A refused change springs back at once.
         connect(r, &QRadioButton::clicked, this, [this, i] {
             m_engine.Option2_Click(i);
             refresh();
@@ -169,6 +203,16 @@ void ccForm1_line_view::build()
     dialLayout->addWidget(frame5);
     dialLayout->addWidget(frame3, 1);
 
+    column->addWidget(frame4);
+    column->addWidget(frame9);
+    column->addWidget(frame8);
+    column->addWidget(frameDial);
+}
+
+QWidget* ccForm1_line_view::buildState()
+{
+    ccForm1_engine& e = m_engine;
+    const auto bind = [this](const ControlState& state, QWidget* w) { m_binder.bind(state, w); };
     // State of the link and the instrument's identity.
     auto* stateBox = new QGroupBox(tr("Link"));
     auto* stateForm = new QFormLayout(stateBox);
@@ -196,47 +240,45 @@ void ccForm1_line_view::build()
     addBox(e.version, QStringLiteral("version"), tr("Version"));
     addBox(e.resets, QStringLiteral("resets"), tr("Resets"));
     addBox(e.time, QStringLiteral("time"), tr("Time"));
+    return stateBox;
+}
 
-    // Status panels.
+QLayout* ccForm1_line_view::buildStatusRow()
+{
     auto* statusRow = new QHBoxLayout;
     for (int i = 1; i <= 3; ++i) {
         auto* l = new QLabel;
         l->setObjectName(arrayName("sbrStatus", i));
         l->setFrameStyle(QFrame::Panel | QFrame::Sunken);
-        bind(e.sbrStatus[i], l);
+        m_binder.bind(m_engine.sbrStatus[i], l);
         statusRow->addWidget(l, i == 3 ? 0 : 1);
     }
-
-    auto* left = new QVBoxLayout;
-    left->addWidget(fraConnection);
-    left->addStretch();
-    auto* right = new QVBoxLayout;
-    right->addWidget(frame4);
-    right->addWidget(frame9);
-    right->addWidget(frame8);
-    right->addWidget(frameDial);
-    right->addWidget(stateBox);
-    right->addStretch();
-    auto* columns = new QHBoxLayout;
-    columns->addLayout(left, 1);
-    columns->addLayout(right, 1);
-    auto* top = new QVBoxLayout(this);
-    top->addLayout(columns, 1);
-    top->addLayout(statusRow);
+    return statusRow;
 }
 
-void ccForm1_line_view::fillCombo(QComboBox* box, const QStringList& items)
+bool ccForm1_line_view::fillCombo(QComboBox* box, const QStringList& items)
 {
     QStringList have;
     for (int i = 0; i < box->count(); ++i)
         have << box->itemText(i);
-    if (have != items) {
-        box->clear();
-        box->addItems(items);
-    }
+    if (have == items)
+        return false;
+    box->clear();
+    box->addItems(items);
+    return true;
 }
 
-void ccForm1_line_view::fillPorts()
+bool ccForm1_line_view::fillLists()
+{
+    bool filled = fillPorts();
+    filled = fillCombo(m_cboSpeed, m_engine.cboSpeedItems) || filled;
+    filled = fillCombo(m_cboParity, m_engine.cboParityItems) || filled;
+    filled = fillCombo(m_cboDataBits, m_engine.cboDataBitsItems) || filled;
+    filled = fillCombo(m_cboStopBits, m_engine.cboStopBitsItems) || filled;
+    return filled;
+}
+
+bool ccForm1_line_view::fillPorts()
 {
     const auto& ports = m_engine.cboPortItems;
     bool same = m_cboPort->count() == ports.size();
@@ -257,18 +299,5 @@ void ccForm1_line_view::fillPorts()
             about = p.description;
     m_portDescription->setText(about);
     m_portDescription->setVisible(!about.isEmpty());
-}
-
-void ccForm1_line_view::refresh()
-{
-    fillPorts();
-    fillCombo(m_cboSpeed, m_engine.cboSpeedItems);
-    fillCombo(m_cboParity, m_engine.cboParityItems);
-    fillCombo(m_cboDataBits, m_engine.cboDataBitsItems);
-    fillCombo(m_cboStopBits, m_engine.cboStopBitsItems);
-    for (const auto& [state, widget] : std::as_const(m_bound))
-        applyControlState(*static_cast<const ControlState*>(state), widget);
-    // An editable box shows the port's name, also one typed and not listed.
-    if (m_cboPort->currentText() != m_engine.cboPort.text && !m_cboPort->lineEdit()->hasFocus())
-        m_cboPort->setEditText(m_engine.cboPort.text);
+    return !same;
 }

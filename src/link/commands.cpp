@@ -32,15 +32,23 @@ QByteArray prefix(Sender sender)
 
 QByteArray framed(Sender sender, const QByteArray& body)
 {
-    return prefix(sender) + body + EOT;
+    return framed(prefix(sender), body);
 }
+
+QByteArray framed(const QByteArray& prefix, const QByteArray& body)
+{
+    return prefix + body + EOT;
+}
+
+QByteArray unprefixed(const QByteArray& body) { return body + EOT; }
 
 QByteArray connectDirect() { return framed(Sender::DirectConnect, "CONNECTK"); }
 QByteArray identifyAfterCall() { return QByteArrayLiteral("K"); }
 QByteArray disconnectDirect() { return prefix(Sender::Disconnect) + "ATH"; }
 
-QByteArray statusRequest() { return QByteArray("F") + EOT; }
-QByteArray pressureRequest() { return QByteArray("T") + EOT; }
+QByteArray statusRequest() { return unprefixed("F"); }
+QByteArray pressureRequest() { return unprefixed("T"); }
+QByteArray torvanelRequest() { return framed(Sender::StatusP, "t"); }
 QByteArray nextRecord() { return QByteArray(1, EOT); }
 QByteArray acceptWrite() { return QByteArrayLiteral("X"); }
 QByteArray breakOff() { return QByteArrayLiteral("V"); }

@@ -31,6 +31,10 @@ int prefixLength(Sender sender);
 QByteArray prefix(Sender sender);
 // prefix, body, EOT: the common framing of an instrument command.
 QByteArray framed(Sender sender, const QByteArray& body);
+// The same with a prefix the sender keeps (prefix(sender)).
+QByteArray framed(const QByteArray& prefix, const QByteArray& body);
+// body, EOT: the requests that go without a prefix.
+QByteArray unprefixed(const QByteArray& body);
 
 // --- ccForm1 ---
 QByteArray connectDirect();     // 30 Z, "CONNECTK", EOT
@@ -41,6 +45,7 @@ QByteArray disconnectDirect();
 // --- the views ---
 QByteArray statusRequest();        // "F", EOT, no prefix
 QByteArray pressureRequest();      // "T", EOT, no prefix
+QByteArray torvanelRequest();      // 85 Z, "t", EOT
 QByteArray nextRecord();           // EOT alone: record taken, send the next
 QByteArray acceptWrite();          // "X"
 QByteArray breakOff();             // "V"
@@ -55,7 +60,8 @@ QByteArray modemEscape();          // "+++", no line end
 QByteArray modemAskModulation();   // "AT+MS?" CR LF
 QByteArray modemCommand(const QString& text); // "AT" + text, CR LF
 
-// Tokens in the order the dispatcher (reply_do) looks for them.
+// Tokens that end the replies; the dispatcher's table (reply_do) gives the
+// order in which they are looked for.
 enum class Token {
     NoDialtone, Busy, NoCarrier, Connect, Glacinor, Sret, Schanupload, Downcheck,
     Donedown, Reset, Dlres, Histy, Plres, Power, Status, Presss, Torvan, Realarms,

@@ -33,9 +33,35 @@ public:
         ChangeNotifier* m_n;
     };
 
+    // While a modal box stands the event loop runs: a timer or an arrival
+    // handled under it is an outermost procedure there and tells its own end.
+    class Box {
+    public:
+        explicit Box(ChangeNotifier& n) : m_n(&n), m_depth(n.m_depth) { n.m_depth = 0; }
+        Box(Box&& other) noexcept : m_n(other.m_n), m_depth(other.m_depth) { other.m_n = nullptr; }
+        Box(const Box&) = delete;
+        Box& operator=(const Box&) = delete;
+        Box& operator=(Box&&) = delete;
+        ~Box()
+        {
+            if (m_n)
+                m_n->m_depth = m_depth;
+        }
+
+    private:
+        ChangeNotifier* m_n;
+        int m_depth;
+    };
+
     [[nodiscard]] Scope procedure() { return Scope(*this); }
     // The views show what the procedure has done so far (before a box).
     void flush() { m_tell(); }
+    // flush(), and procedures running until the box ends tell for themselves.
+    [[nodiscard]] Box box()
+    {
+        flush();
+        return Box(*this);
+    }
     bool inProcedure() const { return m_depth > 0; }
 
 private:

@@ -74,10 +74,10 @@ QSerialPort::FlowControl toFlow(Handshaking h)
 
 } // namespace
 
-SerialLine::SerialLine(QObject* parent) : Line(parent)
+SerialLine::SerialLine(QObject* parent) : DeviceLine(parent)
 {
+    setDevice(m_port);
     m_pinTimer.setInterval(PinPollMs);
-    connect(&m_port, &QSerialPort::readyRead, this, &SerialLine::onReadyRead);
     connect(&m_port, &QSerialPort::errorOccurred, this, &SerialLine::onError);
     connect(&m_pinTimer, &QTimer::timeout, this, &SerialLine::pollPins);
 }
@@ -190,7 +190,7 @@ bool SerialLine::open(QString* error)
     return true;
 }
 
-void SerialLine::close()
+void SerialLine::closeDevice()
 {
     m_pinTimer.stop();
     if (m_port.isOpen())
@@ -199,62 +199,11 @@ void SerialLine::close()
     m_isPty = false;
 }
 
-bool SerialLine::write(const QByteArray& bytes)
-{
-    if (!isOpen())
-        return false;
-    if (m_port.write(bytes) != bytes.size())
-        return false;
-    // Out at once, as the control's Output does; what the driver cannot take
-    // yet follows from the event loop.
-    m_port.flush();
-    m_wroteSinceArrival = true;
-    return true;
-}
-
-void SerialLine::discardInput()
-{
-    if (!isOpen())
-        return;
-    // What reached the program and was not handled goes.
-    m_port.readAll();
-    // What still waits in the driver goes too, unless something was written
-    // since the last arrival: then it can only be the answer to that write.
-    // On a real line no answer comes back within the moment between a write
-    // and the discard behind it, but a pseudo-terminal or a serial server
-    // answers at once, and that answer must not be thrown away.
-    if (!m_wroteSinceArrival)
-        m_port.clear(QSerialPort::Input);
-}
-
 void SerialLine::setDtr(bool on)
 {
     m_dtr = on;
     if (isOpen())
         m_port.setDataTerminalReady(on);
-}
-
-void SerialLine::onReadyRead()
-{
-    // Handed on from the event loop rather than from inside the port's
-    // signal: the port does not signal again while its signal runs, so bytes
-    // arriving under a message box of the receiver would wait unseen and be
-    // discarded behind the box.
-    if (m_deliveryQueued)
-        return;
-    m_deliveryQueued = true;
-    QMetaObject::invokeMethod(this, &SerialLine::deliverArrived, Qt::QueuedConnection);
-}
-
-void SerialLine::deliverArrived()
-{
-    m_deliveryQueued = false;
-    if (!isOpen())
-        return;
-    m_wroteSinceArrival = false;
-    const QByteArray bytes = m_port.readAll();
-    if (!bytes.isEmpty())
-        emit received(bytes);
 }
 
 void SerialLine::onError(QSerialPort::SerialPortError error)
@@ -268,18 +217,12 @@ void SerialLine::onError(QSerialPort::SerialPortError error)
         [[fallthrough]];
     case QSerialPort::ResourceError:
         // The port has stopped reading by now; the line is of no more use.
-        if (!isOpen())
-            return;
-        // Whatever came before the loss is still the instrument's.
-        deliverArrived();
-        if (!isOpen())
-            return;
-        close();
-        emit lineEvent(LineLost);
+        if (isOpen())
+            deviceLost();
         break;
     case QSerialPort::WriteError:
     case QSerialPort::TimeoutError:
-        emit lineEvent(TransmitFull);
+        writeFailed();
         break;
     default:
         // Refused operations (DTR on a pty), read hiccups and the reset to

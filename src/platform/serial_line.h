@@ -1,6 +1,6 @@
 #pragma once
 
-#include "platform/line.h"
+#include "platform/device_line.h"
 
 #include <QSerialPort>
 #include <QTimer>
@@ -13,9 +13,7 @@
 // or break conditions, so 1004, 1009 and 1001 do not occur here; the receive
 // handler ignores those three anyway.
 // A device that goes away under the open line (USB unplugged, pty master
-// closed) closes the line and is reported as LineLost.
-// Arrivals are delivered from the event loop, so a receiver that stands in
-// a message box still gets the bytes that come meanwhile. Operations the device
+// closed) closes the line and is reported as LineLost. Operations the device
 // does not support (DTR on a pty, 1.5 stop bits) are not events, and on a
 // pty, which has no wire, refused settings are not errors either.
 //
@@ -23,28 +21,19 @@
 // they are read every 200 ms and changes of CTS, DSR and CD become events 3,
 // 4 and 5, and a rising ring indicator event 6. Pseudo-terminals have no
 // pins and are not polled.
-class SerialLine : public Line {
+class SerialLine : public DeviceLine {
     Q_OBJECT
 public:
     explicit SerialLine(QObject* parent = nullptr);
     ~SerialLine() override;
 
-    void setPortName(const QString& name) override { m_portName = name; }
-    QString portName() const override { return m_portName; }
     bool setSettings(const LineSettings& settings, QString* error = nullptr) override;
-    LineSettings settings() const override { return m_settings; }
     void setHandshaking(Handshaking h) override;
-    Handshaking handshaking() const { return m_handshaking; }
 
     bool open(QString* error = nullptr) override;
-    void close() override;
     bool isOpen() const override { return m_port.isOpen(); }
 
-    bool write(const QByteArray& bytes) override;
-    void discardInput() override;
-
     void setDtr(bool on) override;
-    bool dtr() const override { return m_dtr; }
 
     // True while the open device is a pseudo-terminal.
     bool isPseudoTerminal() const { return m_isPty; }
@@ -52,8 +41,9 @@ public:
     static constexpr int PinPollMs = 200;
 
 private:
-    void onReadyRead();
-    void deliverArrived();
+    void closeDevice() override;
+    void flushOutput() override { m_port.flush(); }
+    void dropWaitingInput() override { m_port.clear(QSerialPort::Input); }
     void onError(QSerialPort::SerialPortError error);
     void pollPins();
     bool applySettings(QString* error);
@@ -61,14 +51,6 @@ private:
 
     QSerialPort m_port;
     QTimer m_pinTimer;
-    QString m_portName;
-    LineSettings m_settings;
-    Handshaking m_handshaking = Handshaking::None;
-    // The communications control starts with DTR enabled, and a modem needs
-    // it to listen.
-    bool m_dtr = true;
     bool m_isPty = false;
-    bool m_wroteSinceArrival = false;
-    bool m_deliveryQueued = false;
     QSerialPort::PinoutSignals m_pins;
 };

@@ -2,10 +2,11 @@
 
 #include <QRegularExpression>
 
-TcpLine::TcpLine(QObject* parent) : Line(parent)
+TcpLine::TcpLine(QObject* parent) : DeviceLine(parent)
 {
-    connect(&m_socket, &QTcpSocket::readyRead, this, &TcpLine::onReadyRead);
-    connect(&m_socket, &QTcpSocket::disconnected, this, &TcpLine::onDisconnected);
+    setDevice(m_socket);
+    // The far end closing the connection is the line going away.
+    connect(&m_socket, &QTcpSocket::disconnected, this, &TcpLine::deviceLost);
 }
 
 TcpLine::~TcpLine()
@@ -37,12 +38,6 @@ bool TcpLine::splitAddress(const QString& name, QString* host, quint16* port)
 bool TcpLine::looksLikeTcp(const QString& name)
 {
     return splitAddress(name, nullptr, nullptr);
-}
-
-bool TcpLine::setSettings(const LineSettings& settings, QString*)
-{
-    m_settings = settings;
-    return true;
 }
 
 bool TcpLine::open(QString* error)
@@ -85,68 +80,7 @@ bool TcpLine::open(QString* error)
     return false;
 }
 
-void TcpLine::close()
-{
-    ++m_closes;
-    m_closing = true;
-    m_socket.abort();
-    m_closing = false;
-}
-
 bool TcpLine::isOpen() const
 {
     return m_socket.state() == QAbstractSocket::ConnectedState;
-}
-
-bool TcpLine::write(const QByteArray& bytes)
-{
-    if (!isOpen())
-        return false;
-    if (m_socket.write(bytes) != bytes.size())
-        return false;
-    m_socket.flush();
-    m_wroteSinceArrival = true;
-    return true;
-}
-
-void TcpLine::discardInput()
-{
-    // As on a serial line: once something was written since the last
-    // arrival, what waits is the answer to it and stays. A closed socket has
-    // nothing to give (and Qt warns about the read).
-    if (!m_wroteSinceArrival && m_socket.isOpen())
-        m_socket.readAll();
-}
-
-void TcpLine::onReadyRead()
-{
-    // From the event loop, as on a serial line: the socket does not signal
-    // again while its signal runs.
-    if (m_deliveryQueued)
-        return;
-    m_deliveryQueued = true;
-    QMetaObject::invokeMethod(this, &TcpLine::deliverArrived, Qt::QueuedConnection);
-}
-
-void TcpLine::deliverArrived()
-{
-    m_deliveryQueued = false;
-    m_wroteSinceArrival = false;
-    const QByteArray bytes = m_socket.readAll();
-    if (!bytes.isEmpty())
-        emit received(bytes);
-}
-
-void TcpLine::onDisconnected()
-{
-    if (m_closing)
-        return;
-    // The last reply before the hang-up still belongs to the instrument; it
-    // may itself end the link, and then nothing more is to be reported.
-    const int closes = m_closes;
-    deliverArrived();
-    if (m_closes != closes)
-        return;
-    close();
-    emit lineEvent(LineLost);
 }

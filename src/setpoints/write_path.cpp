@@ -35,7 +35,7 @@ QString pEcho(const QByteArray& body)
 
 QByteArray pCommand(const QByteArray& prefix, const QByteArray& body)
 {
-    return prefix + body + commands::EOT;
+    return commands::framed(prefix, body);
 }
 
 QByteArray checkBoxBody(int index, int channel, int value, int subfunction, int group)

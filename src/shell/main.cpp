@@ -3,11 +3,11 @@
 #include "link/ccform1_engine.h"
 #include "link/link_globals.h"
 #include "link/open_views.h"
+#include "platform/line_factory.h"
 #include "platform/clock.h"
 #include "platform/settings.h"
 #include "platform/widget_operator.h"
 #include "shell/app_version.h"
-#include "shell/builtin_simulator_line.h"
 #include "shell/ccform1_view.h"
 #include "shell/frmsplash_view.h"
 #include "shell/mdiform1_view.h"
@@ -32,6 +32,48 @@ namespace {
 QString demoFolder()
 {
     return QStandardPaths::writableLocation(QStandardPaths::GenericDataLocation) + QStringLiteral("/q19-demo");
+}
+
+// The connection form's two halves: the directory chooses the instrument,
+// the line side connects to it.
+void connectLineToDirectory(ccForm1_engine& line, ccForm1_directory& directory, const LinkGlobals& globals,
+                            QString& connectedId)
+{
+    QObject::connect(&directory, &ccForm1_directory::instrumentSelected, &line, &ccForm1_engine::setInstrument);
+    QObject::connect(&directory, &ccForm1_directory::propertySettingsWanted, &line,
+                     &ccForm1_engine::instrumentOpened);
+    QObject::connect(&line, &ccForm1_engine::changed, &directory, [&] {
+        if (!globals.link_up)
+            connectedId.clear();
+        else if (connectedId.isEmpty())
+            connectedId = directory.openId();
+    });
+    directory.setConnectedInstrument([&] { return globals.link_up ? connectedId : QString(); });
+    QObject::connect(&directory, &ccForm1_directory::addingChanged, &line,
+                     [&line](bool adding) { line.setDialAllowed(!adding); });
+}
+
+void registerViews(MDIForm1& mainWindow, ccForm1_engine& line, ccForm1_directory& directory,
+                   const DataFolder& folder, Clock& clock, Operator& op)
+{
+    // The views this workstation has. Each window owns its engine; a view
+    // whose data base fails has said so and started dbase_error, and still
+    // stands until that closes everything.
+    const auto storeOf = [&folder, &directory] { return folder.instrumentFile(directory.openId()); };
+    mainWindow.registerView(ViewId::status, [&line, &clock, &op, &directory, storeOf](OpenViews& v) -> QWidget* {
+        auto* engine = new frmstatus_engine(line, clock, op, v);
+        engine->Form_Load(directory.openId(), storeOf());
+        auto* view = new frmstatus_view(*engine);
+        engine->setParent(view);
+        return view;
+    });
+    mainWindow.registerView(ViewId::statusp, [&line, &clock, &op, &directory, storeOf](OpenViews& v) -> QWidget* {
+        auto* engine = new frmstatusp_engine(line, clock, op, v);
+        engine->Form_Load(directory.openId(), storeOf());
+        auto* view = new frmstatusp_view(*engine);
+        engine->setParent(view);
+        return view;
+    });
 }
 
 } // namespace
@@ -99,49 +141,16 @@ int main(int argc, char* argv[])
 
     ccForm1_engine* lineEngine = nullptr;
     auto lineFactory = [&lineEngine](const QString& port) {
-        return makeWorkstationLine(port, [&lineEngine] { return lineEngine && lineEngine->Option2[0].value.toBool(); });
+        return makeWorkstationLine(port, [&lineEngine] { return lineEngine && lineEngine->modemSelected(); });
     };
     ccForm1_engine line(clock, op, settings, views, globals, lineFactory);
     lineEngine = &line;
     ccForm1_directory directory(folder, op);
-    QObject::connect(&directory, &ccForm1_directory::instrumentSelected, &line, &ccForm1_engine::setInstrument);
-    QObject::connect(&directory, &ccForm1_directory::propertySettingsWanted, &line, [&line] {
-        line.no_computer_link = false;
-        line.LoadPropertySettings();
-    });
     // The instrument the line was opened for, while it is up.
     QString connectedId;
-    QObject::connect(&line, &ccForm1_engine::changed, &directory, [&] {
-        if (!globals.link_up)
-            connectedId.clear();
-        else if (connectedId.isEmpty())
-            connectedId = directory.openId();
-    });
-    directory.setConnectedInstrument([&] { return globals.link_up ? connectedId : QString(); });
-    // No call may start while a new instrument is half typed in.
-    QObject::connect(&directory, &ccForm1_directory::addingChanged, &line, [&line](bool adding) {
-        line.dial_num.enabled = !adding;
-        emit line.changed();
-    });
+    connectLineToDirectory(line, directory, globals, connectedId);
 
-    // The views this workstation has. Each window owns its engine; a view
-    // whose data base fails has said so and started dbase_error, and still
-    // stands until that closes everything.
-    const auto storeOf = [&folder, &directory] { return folder.instrumentFile(directory.openId()); };
-    mainWindow.registerView(ViewId::status, [&](OpenViews& v) -> QWidget* {
-        auto* engine = new frmstatus_engine(line, clock, op, v);
-        engine->Form_Load(directory.openId(), storeOf());
-        auto* view = new frmstatus_view(*engine);
-        engine->setParent(view);
-        return view;
-    });
-    mainWindow.registerView(ViewId::statusp, [&](OpenViews& v) -> QWidget* {
-        auto* engine = new frmstatusp_engine(line, clock, op, v);
-        engine->Form_Load(directory.openId(), storeOf());
-        auto* view = new frmstatusp_view(*engine);
-        engine->setParent(view);
-        return view;
-    });
+    registerViews(mainWindow, line, directory, folder, clock, op);
 
     mainWindow.engine().setLink(&line);
     mainWindow.engine().MDIForm_Load();

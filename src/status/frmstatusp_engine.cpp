@@ -1,5 +1,6 @@
 #include "status/frmstatusp_engine.h"
 
+#include "link/commands.h"
 #include "link/link.h"
 #include "link/link_globals.h"
 #include "platform/operator.h"
@@ -15,8 +16,6 @@ constexpr int kBanksInUseField = 83;
 constexpr int kCompressorKindField = 165;
 constexpr int kEqualizerField = 167;
 constexpr int kCondenserKindField = 169;
-// The request carries a fixed filler of 85 "Z" before the letter.
-const QByteArray kTorvanelRequest = QByteArray(85, 'Z') + "t\x04";
 
 const QString kUnknown = QStringLiteral("????");
 
@@ -347,7 +346,7 @@ void frmstatusp_engine::afterFlash()
 void frmstatusp_engine::send_torvanel_request()
 {
     if (m_link.globals().link_up)
-        m_link.Output(kTorvanelRequest);
+        m_link.Output(commands::torvanelRequest());
     m_link.startWaitUd();
 }
 

@@ -1,5 +1,6 @@
 #include "status/status_cycle.h"
 
+#include "link/commands.h"
 #include "link/link.h"
 #include "link/link_globals.h"
 #include "link/open_views.h"
@@ -151,7 +152,7 @@ void StatusCycle::setCeased(bool shown)
 void StatusCycle::send_status_request()
 {
     if (m_link.globals().link_up)
-        m_link.Output(QByteArray(m_params.letter) + '\x04');
+        m_link.Output(commands::unprefixed(m_params.letter));
     // The timers run as if the request went out, so that the watchdog ends a
     // cycle whose line has gone.
     m_link.startWaitUd();

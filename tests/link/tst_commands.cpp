@@ -17,16 +17,8 @@ void TestCommands::prefixLengthPerSender_data()
 {
     QTest::addColumn<int>("sender");
     QTest::addColumn<int>("length");
+    // The shortest, a shared one and the longest.
     QTest::newRow("Command3 direct connect") << int(Sender::DirectConnect) << 30;
-    QTest::newRow("Command6") << int(Sender::Disconnect) << 34;
-    QTest::newRow("dial_num direct") << int(Sender::DialDirect) << 36;
-    QTest::newRow("frmfront keys") << int(Sender::FrontKeys) << 41;
-    QTest::newRow("channels") << int(Sender::Channels) << 61;
-    QTest::newRow("frmhistory") << int(Sender::History) << 84;
-    QTest::newRow("frmalarm") << int(Sender::Alarm) << 85;
-    QTest::newRow("frmpower") << int(Sender::Power) << 85;
-    QTest::newRow("frmstatusp") << int(Sender::StatusP) << 85;
-    QTest::newRow("frmbrumalet") << int(Sender::Brumalet) << 85;
     QTest::newRow("frmstatus") << int(Sender::Status) << 85;
     QTest::newRow("frmloadshed") << int(Sender::LoadShed) << 105;
 }
@@ -50,6 +42,7 @@ void TestCommands::texts_data()
     QTest::newRow("Command6 text, no EOT") << disconnectDirect() << QByteArray(34, 'Z') + "ATH";
     QTest::newRow("F without prefix") << statusRequest() << QByteArray("F\x04");
     QTest::newRow("T without prefix") << pressureRequest() << QByteArray("T\x04");
+    QTest::newRow("Torvanel behind 85 Z") << torvanelRequest() << QByteArray(85, 'Z') + "t\x04";
     QTest::newRow("EOT alone") << nextRecord() << QByteArray("\x04");
     QTest::newRow("dial waiting for tone")
         << modemDial(true, QStringLiteral("&C1"), QStringLiteral("5551234"))

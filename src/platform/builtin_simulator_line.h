@@ -53,7 +53,3 @@ private:
     Handshaking m_handshaking = Handshaking::None;
     bool m_dtr = false;
 };
-
-// The line for a port name: the built-in simulator for its name, else what
-// makeLine() gives. modemWanted is asked when the simulator starts.
-std::unique_ptr<Line> makeWorkstationLine(const QString& portName, std::function<bool()> modemWanted);

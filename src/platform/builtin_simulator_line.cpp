@@ -1,4 +1,4 @@
-#include "shell/builtin_simulator_line.h"
+#include "platform/builtin_simulator_line.h"
 
 #include "platform/line_factory.h"
 
@@ -153,11 +153,4 @@ void BuiltinSimulatorLine::setDtr(bool on)
     m_dtr = on;
     if (m_inner)
         m_inner->setDtr(on);
-}
-
-std::unique_ptr<Line> makeWorkstationLine(const QString& portName, std::function<bool()> modemWanted)
-{
-    if (portName == BuiltinSimulatorLine::PortName)
-        return std::make_unique<BuiltinSimulatorLine>(std::move(modemWanted));
-    return makeLine(portName);
 }
