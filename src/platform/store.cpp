@@ -631,12 +631,17 @@ struct Recordset::Statements {
     bool insertReady = false;
     bool removeReady = false;
     // Keyed by the fields written, so that an edit writes only what changed.
-    QHash<QString, QSqlQuery> updates;
+    QHash<QList<int>, QSqlQuery> updates;
     // One field of one row, by ordinal.
     QHash<int, QSqlQuery> cells;
     // Some fields of one row, keyed by the fields read.
-    QHash<QString, QSqlQuery> partial;
+    QHash<QList<int>, QSqlQuery> partial;
     QSqlDatabase db;
+    // Values are bound by name: the driver builds a text key for every
+    // positional bind, which costs more than the write itself on a wide row.
+    QStringList names;
+    const QString rowName = QStringLiteral(":rid");
+    const QString& name(int ordinal) const { return names.at(ordinal); }
 };
 
 Recordset::Recordset(Store& store, QString table, QList<Store::Column> columns, QString orderBy)
@@ -647,6 +652,9 @@ Recordset::Recordset(Store& store, QString table, QList<Store::Column> columns, 
         m_types.append(c.type);
     }
     m_sql = std::make_unique<Statements>(QSqlDatabase::database(store.connectionName(), false));
+    m_sql->names.reserve(m_fields.size());
+    for (int i = 0; i < m_fields.size(); ++i)
+        m_sql->names.append(QStringLiteral(":f%1").arg(i));
     store.m_recordsets.append(this);
 }
 
@@ -796,12 +804,12 @@ bool Recordset::fetchRow(qint64 rowId, QVariantList* values) const
         for (const QString& f : m_fields)
             cols.append(quoted(f));
         q.setForwardOnly(true);
-        if (!q.prepare(QStringLiteral("SELECT %1 FROM %2 WHERE %3 = ?")
+        if (!q.prepare(QStringLiteral("SELECT %1 FROM %2 WHERE %3 = :rid")
                            .arg(cols.join(QLatin1String(", ")), quoted(m_table), sqlite::RowId)))
             return fail(errorText(q.lastError()));
         m_sql->selectReady = true;
     }
-    q.bindValue(0, rowId);
+    q.bindValue(m_sql->rowName, rowId);
     if (!q.exec())
         return fail(errorText(q.lastError()));
     if (!q.next()) {
@@ -865,10 +873,7 @@ QVariantList Recordset::values(const QList<int>& ordinals) const
             out.append(value(o));
         return out;
     }
-    QString key;
-    for (int o : ordinals)
-        key += QString::number(o) + QLatin1Char(',');
-    auto it = m_sql->partial.find(key);
+    auto it = m_sql->partial.find(ordinals);
     if (it == m_sql->partial.end()) {
         // Records have few layouts; a runaway cache is cut back, not grown.
         if (m_sql->partial.size() > 64)
@@ -878,13 +883,13 @@ QVariantList Recordset::values(const QList<int>& ordinals) const
             cols.append(quoted(m_fields.at(o)));
         QSqlQuery q(m_sql->db);
         q.setForwardOnly(true);
-        if (!q.prepare(QStringLiteral("SELECT %1 FROM %2 WHERE %3 = ?")
+        if (!q.prepare(QStringLiteral("SELECT %1 FROM %2 WHERE %3 = :rid")
                            .arg(cols.join(QLatin1String(", ")), quoted(m_table), sqlite::RowId)))
             return fail(errorText(q.lastError())), QVariantList();
-        it = m_sql->partial.insert(key, q);
+        it = m_sql->partial.insert(ordinals, q);
     }
     QSqlQuery& q = it.value();
-    q.bindValue(0, m_rowIds.at(m_pos));
+    q.bindValue(m_sql->rowName, m_rowIds.at(m_pos));
     if (!q.exec())
         return fail(errorText(q.lastError())), QVariantList();
     if (!q.next()) {
@@ -920,6 +925,45 @@ QVariantList Recordset::column(int ordinal)
     out.reserve(m_rowIds.size());
     for (qint64 id : m_rowIds)
         out.append(byRow.value(id));
+    return out;
+}
+
+QList<QVariantList> Recordset::rows(const QList<int>& positions, const QList<int>& ordinals)
+{
+    for (int o : ordinals)
+        if (o < 0 || o >= fieldCount())
+            return fail(QStringLiteral("There is no field %1").arg(o)), QList<QVariantList>();
+    QStringList ids;
+    for (int p : positions) {
+        if (p < 0 || p >= RecordCount())
+            return fail(QStringLiteral("Position %1 is out of range").arg(p)), QList<QVariantList>();
+        ids.append(QString::number(m_rowIds.at(p)));
+    }
+    if (!m_sql)
+        return fail(StoreClosed), QList<QVariantList>();
+    QStringList cols{sqlite::RowId};
+    for (int o : ordinals)
+        cols.append(quoted(m_fields.at(o)));
+    QSqlQuery q(m_sql->db);
+    q.setForwardOnly(true);
+    // The row numbers are the set's own integers, written into the text.
+    if (!q.exec(QStringLiteral("SELECT %1 FROM %2 WHERE %3 IN (%4)")
+                    .arg(cols.join(QLatin1String(", ")), quoted(m_table), sqlite::RowId,
+                         ids.join(QLatin1String(", ")))))
+        return fail(errorText(q.lastError())), QList<QVariantList>();
+    QHash<qint64, QVariantList> byRow;
+    byRow.reserve(positions.size());
+    while (q.next()) {
+        QVariantList row;
+        row.reserve(ordinals.size());
+        for (int i = 0; i < ordinals.size(); ++i)
+            row.append(fromStored(m_types.at(ordinals.at(i)), q.value(i + 1)));
+        byRow.insert(q.value(0).toLongLong(), row);
+    }
+    QList<QVariantList> out;
+    out.reserve(positions.size());
+    for (int p : positions)
+        out.append(byRow.value(m_rowIds.at(p), QVariantList(ordinals.size())));
     return out;
 }
 
@@ -968,10 +1012,7 @@ bool Recordset::writeRow(qint64 rowId, const QList<int>& ordinals, const QVarian
 {
     if (!m_sql)
         return fail(StoreClosed);
-    QString key;
-    for (int o : ordinals)
-        key += QString::number(o) + QLatin1Char(',');
-    auto it = m_sql->updates.find(key);
+    auto it = m_sql->updates.find(ordinals);
     if (it == m_sql->updates.end()) {
         // Edits follow few patterns beyond one field at a time; a runaway
         // cache is cut back, not grown.
@@ -979,17 +1020,17 @@ bool Recordset::writeRow(qint64 rowId, const QList<int>& ordinals, const QVarian
             m_sql->updates.clear();
         QStringList sets;
         for (int o : ordinals)
-            sets.append(quoted(m_fields.at(o)) + QLatin1String(" = ?"));
+            sets.append(quoted(m_fields.at(o)) + QLatin1String(" = ") + m_sql->name(o));
         QSqlQuery q(m_sql->db);
-        if (!q.prepare(QStringLiteral("UPDATE %1 SET %2 WHERE %3 = ?")
+        if (!q.prepare(QStringLiteral("UPDATE %1 SET %2 WHERE %3 = :rid")
                            .arg(quoted(m_table), sets.join(QLatin1String(", ")), sqlite::RowId)))
             return fail(errorText(q.lastError()));
-        it = m_sql->updates.insert(key, q);
+        it = m_sql->updates.insert(ordinals, q);
     }
     QSqlQuery& q = it.value();
     for (int i = 0; i < stored.size(); ++i)
-        q.bindValue(i, stored.at(i));
-    q.bindValue(int(stored.size()), rowId);
+        q.bindValue(m_sql->name(ordinals.at(i)), stored.at(i));
+    q.bindValue(m_sql->rowName, rowId);
     if (!q.exec())
         return fail(errorText(q.lastError()));
     if (q.numRowsAffected() != 1)
@@ -1027,14 +1068,13 @@ bool Recordset::Update()
         QStringList cols;
         for (const QString& f : m_fields)
             cols.append(quoted(f));
-        const QStringList marks(fieldCount(), QStringLiteral("?"));
         if (!q.prepare(QStringLiteral("INSERT INTO %1 (%2) VALUES (%3)")
-                           .arg(quoted(m_table), cols.join(QLatin1String(", ")), marks.join(QLatin1String(", ")))))
+                           .arg(quoted(m_table), cols.join(QLatin1String(", ")), m_sql->names.join(QLatin1String(", ")))))
             return fail(errorText(q.lastError()));
         m_sql->insertReady = true;
     }
     for (int i = 0; i < fieldCount(); ++i)
-        q.bindValue(i, m_dirty.at(i) ? m_buffer.at(i) : QVariant());
+        q.bindValue(m_sql->name(i), m_dirty.at(i) ? m_buffer.at(i) : QVariant());
     if (!q.exec())
         return fail(errorText(q.lastError()));
     const int before = RecordCount();
@@ -1069,12 +1109,12 @@ bool Recordset::Delete()
     leaveEditing();
     QSqlQuery& q = m_sql->remove;
     if (!m_sql->removeReady) {
-        if (!q.prepare(QStringLiteral("DELETE FROM %1 WHERE %2 = ?").arg(quoted(m_table), sqlite::RowId)))
+        if (!q.prepare(QStringLiteral("DELETE FROM %1 WHERE %2 = :rid").arg(quoted(m_table), sqlite::RowId)))
             return fail(errorText(q.lastError()));
         m_sql->removeReady = true;
     }
     const qint64 id = m_rowIds.at(m_pos);
-    q.bindValue(0, id);
+    q.bindValue(m_sql->rowName, id);
     if (!q.exec())
         return fail(errorText(q.lastError()));
     m_rowIds.removeAt(m_pos);
@@ -1126,7 +1166,7 @@ QVariant Recordset::cell(int row, int ordinal)
     if (it == m_sql->cells.end()) {
         QSqlQuery q(m_sql->db);
         q.setForwardOnly(true);
-        if (!q.prepare(QStringLiteral("SELECT %1 FROM %2 WHERE %3 = ?")
+        if (!q.prepare(QStringLiteral("SELECT %1 FROM %2 WHERE %3 = :rid")
                            .arg(quoted(m_fields.at(ordinal)), quoted(m_table), sqlite::RowId))) {
             fail(errorText(q.lastError()));
             return QVariant();
@@ -1134,7 +1174,7 @@ QVariant Recordset::cell(int row, int ordinal)
         it = m_sql->cells.insert(ordinal, q);
     }
     QSqlQuery& q = it.value();
-    q.bindValue(0, m_rowIds.at(row));
+    q.bindValue(m_sql->rowName, m_rowIds.at(row));
     if (!q.exec()) {
         fail(errorText(q.lastError()));
         return QVariant();

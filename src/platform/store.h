@@ -143,6 +143,9 @@ public:
     QVariantList values(const QList<int>& ordinals) const;
     // One field of every record, in the set's order, in one query.
     QVariantList column(int ordinal);
+    // Some fields of some records (by position), in one query: a transfer of
+    // many records pays the driver's work per query once, not per record.
+    QList<QVariantList> rows(const QList<int>& positions, const QList<int>& ordinals);
 
     bool Edit();
     bool AddNew();
