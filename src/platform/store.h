@@ -10,7 +10,7 @@ class Recordset;
 
 // One data base file of the program (SQLite through QtSql). All SQL of the
 // program lives behind this class and Recordset; SQLite-only pragmas sit in
-// store.cpp alone, so that the same store can later live on another server.
+// store_sqlite.cpp alone, so that the same store can later live on another server.
 class Store {
 public:
     // Written into every file the program creates, so that a stranger's file
