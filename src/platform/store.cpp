@@ -135,8 +135,10 @@ int Store::userVersion() const
     QSqlDatabase db = QSqlDatabase::database(m_connection, false);
     int v = 0;
     QString error;
-    if (!sqlite::userVersion(db, &v, &error))
+    if (!sqlite::userVersion(db, &v, &error)) {
         m_lastError = error;
+        return -1;
+    }
     return v;
 }
 
