@@ -10,7 +10,15 @@ class Recordset;
 
 // One data base file of the program (SQLite through QtSql). All SQL of the
 // program lives behind this class and Recordset; SQLite-only pragmas sit in
-// store.cpp alone, so that the same store can later live on another server.
+// store_sqlite.cpp alone, so that the same store can later live on another server.
+//
+// Errors, everywhere in the store: a call that can fail says so in what it
+// returns (false, a null pointer, an invalid QVariant, an empty list, -1 for
+// a number that is never negative) and leaves the reason, in words fit for
+// the user, in lastError() of the object asked (the Store for its own calls
+// and its transactions, the Recordset for a set's calls). Nothing throws and
+// nothing is logged. open() and create() have no object to ask yet: they
+// alone hand the reason back through *error.
 class Store {
 public:
     // Written into every file the program creates, so that a stranger's file
@@ -37,6 +45,7 @@ public:
 
     QString path() const { return m_path; }
     QString lastError() const { return m_lastError; }
+    // -1 when it cannot be read.
     int userVersion() const;
     bool setUserVersion(int v);
 
@@ -143,6 +152,9 @@ public:
     QVariantList values(const QList<int>& ordinals) const;
     // One field of every record, in the set's order, in one query.
     QVariantList column(int ordinal);
+    // Some fields of some records (by position), in one query: a transfer of
+    // many records pays the driver's work per query once, not per record.
+    QList<QVariantList> rows(const QList<int>& positions, const QList<int>& ordinals);
 
     bool Edit();
     bool AddNew();

@@ -2,6 +2,7 @@
 
 #include "setpoints/catalogue.h"
 
+#include <charconv>
 #include <cmath>
 
 namespace channel_record {
@@ -215,10 +216,34 @@ int recordChannel(const QString& record)
     return int(v);
 }
 
+namespace {
+
+// A plain decimal as the instrument sends it, read without the locale
+// machinery of QString::toDouble (ten thousand values an upload). False
+// sends anything else the long way.
+bool plainNumber(const QString& text, double* out)
+{
+    const QStringView s = QStringView(text).trimmed();
+    char buffer[32];
+    if (s.isEmpty() || s.size() >= qsizetype(sizeof buffer))
+        return false;
+    for (qsizetype i = 0; i < s.size(); ++i) {
+        const char16_t c = s[i].unicode();
+        if (!((c >= u'0' && c <= u'9') || c == u'.' || c == u'-'))
+            return false;
+        buffer[i] = char(c);
+    }
+    const char* end = buffer + s.size();
+    const auto [ptr, ec] = std::from_chars(buffer, end, *out);
+    return ec == std::errc() && ptr == end && std::isfinite(*out);
+}
+
+} // namespace
+
 QVariant uploadNumber(const QString& text)
 {
     double v = 0;
-    if (catalogue::numericValue(text, &v))
+    if (plainNumber(text, &v) || catalogue::numericValue(text, &v))
         return catalogue::storeNumber(v);
     return text;
 }

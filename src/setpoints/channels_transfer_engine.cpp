@@ -88,9 +88,15 @@ void channels_transfer_engine::loadValidation()
     const QVariantList fallback = info.column(kInfoDefault);
     const QVariantList minimum = info.column(kInfoMinimum);
     const QVariantList maximum = info.column(kInfoMaximum);
+    // Limits held as text are read as numbers once here, not for every value
+    // of every record; a limit that is no number stays as it is and fails.
+    const auto number = [](const QVariant& v) {
+        double n = 0;
+        return catalogue::numericValue(v, &n) ? QVariant(n) : v;
+    };
     m_validation.clear();
     for (int row = 0; row < kInfoValidationRows && row < fallback.size(); ++row)
-        m_validation.append({fallback[row], minimum.value(row), maximum.value(row)});
+        m_validation.append({fallback[row], number(minimum.value(row)), number(maximum.value(row))});
 }
 
 void channels_transfer_engine::lineLost()
@@ -434,6 +440,8 @@ void channels_transfer_engine::giveUp()
                   QStringLiteral("Re do the last command")},
                  Operator::Icon::Exclamation);
     m_link.emptyReceiveBuffer();
+    m_downRows.clear();
+    m_downFields.clear();
     setButtons(true);
     setForms(true);
     m_upload.Unload();
@@ -469,11 +477,18 @@ void channels_transfer_engine::sin_chan_down_load()
     Recordset& sp = m_store.setpointsTable();
     sp.setAbsolutePosition(down_channel);
     const double version = m_link.globals().versionNumber();
-    // Only the fields that go down are read, in one query.
-    QList<int> fields = channel_record::downloadFields(down_channel, version);
-    if (!fields.contains(catalogue::kDescriptionField))
-        fields.append(catalogue::kDescriptionField);
-    const QVariantList read = sp.values(fields);
+    QList<int> fields;
+    QVariantList read;
+    if (down_all && down_channel < m_downRows.size() && !m_downFields.at(down_channel).isEmpty()) {
+        fields = m_downFields.at(down_channel);
+        read = m_downRows.at(down_channel);
+    } else {
+        // Only the fields that go down are read, in one query.
+        fields = channel_record::downloadFields(down_channel, version);
+        if (!fields.contains(catalogue::kDescriptionField))
+            fields.append(catalogue::kDescriptionField);
+        read = sp.values(fields);
+    }
     std::array<QVariant, catalogue::kSetpointFields> byField;
     for (qsizetype i = 0; i < fields.size() && i < read.size(); ++i)
         byField[std::size_t(fields[i])] = read[i];
@@ -486,9 +501,39 @@ void channels_transfer_engine::sin_chan_down_load()
         sp.Update();
         tx.commit();
         description = normal;
+        if (down_all && down_channel < m_downRows.size()) {
+            const qsizetype at = m_downFields.at(down_channel).indexOf(catalogue::kDescriptionField);
+            if (at >= 0)
+                m_downRows[down_channel][at] = normal;
+        }
     }
     down_record = channel_record::downloadRecord(down_channel, version,
                                                  [&byField](int field) { return byField[std::size_t(field)]; });
+}
+
+// A download of all channels reads its records at its start (the forms
+// that could change them are locked meanwhile), one query for all channels
+// of the same layout: the driver's work per query costs more than a record.
+void channels_transfer_engine::readDownloadRows()
+{
+    const double version = m_link.globals().versionNumber();
+    QHash<QList<int>, QList<int>> channelsByFields;
+    for (int channel = 0; channel < catalogue::kChannels; ++channel) {
+        QList<int> fields = channel_record::downloadFields(channel, version);
+        if (!fields.contains(catalogue::kDescriptionField))
+            fields.append(catalogue::kDescriptionField);
+        channelsByFields[fields].append(channel);
+    }
+    m_downFields = QList<QList<int>>(catalogue::kChannels);
+    m_downRows = QList<QVariantList>(catalogue::kChannels);
+    for (auto it = channelsByFields.cbegin(); it != channelsByFields.cend(); ++it) {
+        const QList<QVariantList> rows = m_store.setpointsTable().rows(it.value(), it.key());
+        // On a failure each record is read as it goes down.
+        for (qsizetype i = 0; i < rows.size(); ++i) {
+            m_downFields[it.value().at(i)] = it.key();
+            m_downRows[it.value().at(i)] = rows.at(i);
+        }
+    }
 }
 
 bool channels_transfer_engine::sendDownRecord(bool fresh)
@@ -520,6 +565,7 @@ void channels_transfer_engine::downloadall_Click()
     down_channel = 0;
     down_timeouts = 0;
     down_mismatches = 0;
+    readDownloadRows();
     setForms(false);
     setButtons(false);
     m_upload.Show(QStringLiteral("Download"), downloadedLabel(1),
@@ -590,6 +636,8 @@ void channels_transfer_engine::done_down()
         ++down_channel;
         down_mismatches = 0;
         if (down_channel > kLastWire) {
+            m_downRows.clear();
+            m_downFields.clear();
             sp.setAbsolutePosition(saved_position >= 0 ? saved_position : 0);
             setButtons(true);
             Timer5.stop();

@@ -112,6 +112,7 @@ private:
     void channelInvalid();
     void timeRepair(int field, int channel);
     bool sendDownRecord(bool fresh);
+    void readDownloadRows();
     void giveUp();
     void loadValidation();
     void confirmedWrite();
@@ -132,6 +133,9 @@ private:
         QVariant fallback, minimum, maximum;
     };
     QList<Validation> m_validation;
+    // A download of all channels: each channel's fields read and their values.
+    QList<QList<int>> m_downFields;
+    QList<QVariantList> m_downRows;
     int m_transferred = 0;
     int m_transferTotal = 0;
     bool m_running = false;
