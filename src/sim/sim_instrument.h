@@ -84,6 +84,9 @@ private:
 
     void instrumentByte(char c);
     void command(const QByteArray& body);
+    void brumaletRequest(const QByteArray& kind, const QByteArray& args);
+    void writeRequest(const QByteArray& kind, const QByteArray& args);
+    void logCommand(char letter, const QByteArray& kind);
     void key(int index);
     void single(char letter);
     void modemBytes(const QByteArray& bytes);
