@@ -10,7 +10,7 @@ void InstrumentState::logAlarm(int channel, int kind, int value)
     a.channel = channel;
     a.description = channel >= 1 && channel <= Channels ? m_desc[channel - 1] : QByteArray("Input ");
     a.kind = kind;
-    a.time = m_now;
+    a.time = now();
     a.value = value;
     alarms.add(a);
     m_newAlarm = true;

@@ -20,9 +20,9 @@ double InstrumentState::noise(double amplitude)
 int InstrumentState::activeSetPoint(int row) const
 {
     const auto& f = m_sp[row];
-    const int day = m_now.date().dayOfWeek() % 7; // Sunday 0
+    const int day = m_weekDay;
     const int mask = f[54 + day] & 15;
-    const int minute = m_now.time().hour() * 60 + m_now.time().minute();
+    const int minute = m_minuteOfDay;
     int chosen = -1;
     for (int i = 0; i < 4; ++i)
         if ((mask & (1 << i)) && f[6 + i] <= minute)
@@ -36,23 +36,33 @@ int InstrumentState::activeSetPoint(int row) const
     return chosen < 0 ? 0 : chosen;
 }
 
+void InstrumentState::readClock()
+{
+    const QDateTime t = now();
+    m_minuteOfDay = t.time().hour() * 60 + t.time().minute();
+    m_weekDay = t.date().dayOfWeek() % 7;
+}
+
 void InstrumentState::advance(qint64 ms)
 {
     m_carryMs += ms;
     const qint64 stepMs = qint64(StepSeconds * 1000);
     while (m_carryMs >= stepMs) {
         m_carryMs -= stepMs;
-        const qint64 minuteBefore = m_now.toSecsSinceEpoch() / 60;
-        m_now = m_now.addMSecs(stepMs);
+        const qint64 minuteBefore = m_nowMs / 60000;
+        m_nowMs += stepMs;
+        const bool newMinute = m_nowMs / 60000 != minuteBefore;
+        if (newMinute)
+            readClock();
         step(StepSeconds);
-        if (m_now.toSecsSinceEpoch() / 60 != minuteBefore)
+        if (newMinute)
             minuteEvents();
     }
 }
 
 void InstrumentState::stepPlantRoom(double dt)
 {
-    const int minute = m_now.time().hour() * 60 + m_now.time().minute();
+    const int minute = m_minuteOfDay;
     for (int w = 0; w < Channels; ++w) {
         const int n = w + 1;
         auto& r = m_rooms[w];
@@ -225,8 +235,7 @@ void InstrumentState::step(double dt)
 
 void InstrumentState::minuteEvents()
 {
-    const QTime t = m_now.time();
-    const int minute = t.hour() * 60 + t.minute();
+    const int minute = m_minuteOfDay;
     // Defrosts at their times.
     for (int w = 0; w < 100; ++w) {
         auto& f = m_sp[w];
@@ -246,7 +255,7 @@ void InstrumentState::minuteEvents()
     // Data log: schedule 1 at the four times, 2 hourly, 3 every 30, 4 every
     // 15, 5 every 5 minutes.
     HistoryRecord rec;
-    rec.time = m_now;
+    rec.time = now();
     rec.values.fill(HistoryRecord::NotLogged, Channels);
     bool any = false;
     for (int w = 0; w < Channels; ++w) {
@@ -272,7 +281,7 @@ void InstrumentState::minuteEvents()
     // The power meter's quarter hours.
     if (minute % 15 == 0 && m_quarterSeconds > 0) {
         PowerRecord p;
-        p.end = m_now;
+        p.end = now();
         p.seconds = int(qRound(m_quarterSeconds));
         p.watts = int(m_energy / m_quarterSeconds);
         power.add(p);

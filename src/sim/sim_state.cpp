@@ -28,8 +28,9 @@ InstrumentState::InstrumentState(const Options& options)
     history.capacity = options.historyCapacity;
     power.capacity = options.powerCapacity;
     const QDateTime start = options.start.isValid() ? options.start : QDateTime::currentDateTime();
-    m_now = start.addSecs(-qint64(options.historyHours) * 3600);
-    m_now = m_now.addMSecs(-m_now.time().msec());
+    const QDateTime from = start.addSecs(-qint64(options.historyHours) * 3600);
+    m_nowMs = from.addMSecs(-from.time().msec()).toMSecsSinceEpoch();
+    readClock();
     seed();
     // Let the plant run up to the start so that the logs hold a past.
     advance(qint64(options.historyHours) * 3600 * 1000);

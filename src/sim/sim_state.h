@@ -97,7 +97,7 @@ public:
     void countReset() { ++m_resets; }
     void setResets(int n) { m_resets = n; }
 
-    QDateTime now() const { return m_now; }
+    QDateTime now() const { return QDateTime::fromMSecsSinceEpoch(m_nowMs); }
     void advance(qint64 ms);
 
     // The set point table, row by wire channel.
@@ -158,6 +158,7 @@ public:
 
 private:
     void setCompressorKind(int row, int kind);
+    void readClock();
     void seed();
     void seedChannel(int wire);
     void seedGlobals();
@@ -174,7 +175,11 @@ private:
     QByteArray m_version;
     int m_resets = 0;
     QRandomGenerator m_rng;
-    QDateTime m_now;
+    // The clock as milliseconds, with the local minute of the day and day
+    // of the week read once a minute: local time is dear to compute.
+    qint64 m_nowMs = 0;
+    int m_minuteOfDay = 0;
+    int m_weekDay = 0; // Sunday 0
     qint64 m_carryMs = 0;
     std::array<std::array<int, Fields>, Channels> m_sp {};
     std::array<QByteArray, Channels> m_desc;
