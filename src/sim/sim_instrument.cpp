@@ -388,18 +388,9 @@ void Instrument::command(const QByteArray& body)
         if (v >= 8)
             reply(kind, torvanelReply(m_state));
         return;
-    case 'J': {
-        bool ok = false;
-        const int channel = args.toInt(&ok);
-        if (!ok)
-            return;
-        reply(kind, brumaletStartReply(channel));
-        // The reading takes its time and then goes out like an unasked
-        // message: it holds back no other reply.
-        if (!m_faults.nocomp)
-            m_out.unasked(brumaletReply(m_state, channel), m_now, m_settings.brumaletDelayMs);
+    case 'J':
+        brumaletRequest(kind, args);
         return;
-    }
     case 'c':
         reply(kind, channelRecord(m_state, m_channelCursor));
         m_channelCursor = (m_channelCursor + 1) % Channels;
@@ -415,19 +406,46 @@ void Instrument::command(const QByteArray& body)
         m_pendingDownload = args;
         echo(kind, args + "downcheck");
         return;
-    case 'P': {
-        QByteArray parts = args;
-        if (parts.endsWith(','))
-            parts.chop(1);
-        // What the instrument cannot hold it does not echo: the sender's
-        // wait runs out and it breaks the dialogue off.
-        m_pendingWrite.reset();
-        if (!m_state.acceptsWrite(parts.split(',')))
-            return;
-        m_pendingWrite = parts.split(',');
-        echo(kind, parts + ",sret");
+    case 'P':
+        writeRequest(kind, args);
+        return;
+    default:
+        logCommand(letter, kind);
         return;
     }
+}
+
+void Instrument::brumaletRequest(const QByteArray& kind, const QByteArray& args)
+{
+    bool ok = false;
+    const int channel = args.toInt(&ok);
+    if (!ok)
+        return;
+    reply(kind, brumaletStartReply(channel));
+    // The reading takes its time and then goes out like an unasked
+    // message: it holds back no other reply.
+    if (!m_faults.nocomp)
+        m_out.unasked(brumaletReply(m_state, channel), m_now, m_settings.brumaletDelayMs);
+}
+
+void Instrument::writeRequest(const QByteArray& kind, const QByteArray& args)
+{
+    QByteArray parts = args;
+    if (parts.endsWith(','))
+        parts.chop(1);
+    // What the instrument cannot hold it does not echo: the sender's
+    // wait runs out and it breaks the dialogue off.
+    m_pendingWrite.reset();
+    if (!m_state.acceptsWrite(parts.split(',')))
+        return;
+    m_pendingWrite = parts.split(',');
+    echo(kind, parts + ",sret");
+}
+
+// The logs: uploads of the alarm, data and power logs, and their clearing.
+void Instrument::logCommand(char letter, const QByteArray& kind)
+{
+    switch (letter) {
     case 'D':
     case 'b':
         startChain(LogKind::Alarm, letter == 'b');

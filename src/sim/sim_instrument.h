@@ -65,6 +65,9 @@ public:
     void start();
     void receive(const QByteArray& bytes);
     void advance(qint64 realMs);
+    // The real time (on advance()'s clock) at which a reply waiting for its
+    // delay falls due; -1 when none is waiting.
+    qint64 nextDue() const { return lineUp() ? m_out.nextDue() : -1; }
     // Restarts: counts a reset, forgets every dialogue, greets again.
     void reset();
     // Loses the line: the modem reports "NO CARRIER"; a direct line goes
@@ -84,6 +87,9 @@ private:
 
     void instrumentByte(char c);
     void command(const QByteArray& body);
+    void brumaletRequest(const QByteArray& kind, const QByteArray& args);
+    void writeRequest(const QByteArray& kind, const QByteArray& args);
+    void logCommand(char letter, const QByteArray& kind);
     void key(int index);
     void single(char letter);
     void modemBytes(const QByteArray& bytes);

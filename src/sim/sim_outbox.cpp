@@ -24,6 +24,15 @@ void Outbox::clear()
     m_sending.clear();
 }
 
+qint64 Outbox::nextDue() const
+{
+    if (!m_sending.isEmpty())
+        return m_nextPiece;
+    if (!m_replies.isEmpty())
+        return qMax(m_replies.first().due, m_unaskedEnd + quietMs);
+    return -1;
+}
+
 void Outbox::pump(qint64 now, bool idle, int pieceBytes, int pieceGapMs)
 {
     for (;;) {

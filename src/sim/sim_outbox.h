@@ -30,6 +30,9 @@ public:
     // Sends what may go now. idle: no dialogue under way and no command
     // half received. Pieces of pieceBytes (0: whole), pieceGapMs apart.
     void pump(qint64 now, bool idle, int pieceBytes, int pieceGapMs);
+    // When the next reply or piece falls due; -1 when none is waiting.
+    // Unasked messages are not counted: they wait for a quiet line anyway.
+    qint64 nextDue() const;
     void clear();
 
 private:

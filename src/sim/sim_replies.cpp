@@ -19,6 +19,42 @@ int wireKind(int storeKind)
     return storeKind == 0 ? 0 : 1;
 }
 
+// Torvanel blocks of 96 characters: 4 temperatures, 4 pressures, an
+// analogue value, 16 inputs, an analogue value, 8 inputs (the first the
+// kind), an analogue value.
+void putTorvanelData(Layout& r, const InstrumentState& s)
+{
+    const Quirks& q = s.quirks;
+    const int comps = s.compressorCount();
+    for (int t = 0; t * 96 < 216 * 6; ++t) {
+        const int base = 96 * t + 1385;
+        const bool fitted = t < comps && (s.field(t, 165) == 8 || s.field(t, 165) == 10);
+        const Compressor& c = s.compressor(t);
+        const int bank = s.compressorBank(t);
+        const int temps[4] = {-50 + int(c.running) * 10, 700 + 50 * c.running, 450, 520};
+        const int press[4] = {s.suctionPressure(bank), s.dischargePressure(bank), s.dischargePressure(bank) + 150, s.dischargePressure(bank) + 120};
+        auto put = [&](int offset, const QByteArray& text) {
+            if (base + offset + text.size() - 1 <= 1385 + 216 * 6 - 1)
+                r.put(base + offset, text);
+        };
+        const bool odd = t == 0 && q.special;
+        for (int i = 0; i < 4; ++i) {
+            put(6 * i, r.number(odd ? q.special : fitted ? temps[i] : NotConnected, 6));
+            put(24 + 6 * i, r.number(odd ? q.special : fitted ? press[i] : NotConnected, 6));
+        }
+        put(48, r.number(fitted ? 40 * c.running : NotConnected, 6));
+        for (int i = 0; i < 16; ++i)
+            put(54 + i, (fitted && ((i == 0 && c.running) || (i == 6 && c.running >= c.units))) ? "1" : "0");
+        put(70, r.number(fitted ? 75 : NotConnected, 6));
+        put(76, "      ");
+        for (int i = 0; i < 8; ++i)
+            put(82 + i, "0");
+        if (t < 27 && q.torvanelKind[t] >= 0)
+            put(82, QByteArray::number(q.torvanelKind[t] % 10));
+        put(90, r.number(fitted ? 60 : NotConnected, 6));
+    }
+}
+
 } // namespace
 
 QByteArray identityReply(const QByteArray& version, int id, int resets, const QDateTime& time)
@@ -129,38 +165,8 @@ QByteArray pressureReply(const InstrumentState& s)
         const Condenser& k = s.condenser(c);
         r.putNum(6 * c + 1313, c < conds && k.stages == 64 ? k.running : 0, 6);
     }
-    if (v >= 6) {
-        // Torvanel blocks of 96 characters: 4 temperatures, 4 pressures, an
-        // analogue value, 16 inputs, an analogue value, 8 inputs (the first
-        // the kind), an analogue value.
-        for (int t = 0; t * 96 < 216 * 6; ++t) {
-            const int base = 96 * t + 1385;
-            const bool fitted = t < comps && (s.field(t, 165) == 8 || s.field(t, 165) == 10);
-            const Compressor& c = s.compressor(t);
-            const int bank = s.compressorBank(t);
-            const int temps[4] = {-50 + int(c.running) * 10, 700 + 50 * c.running, 450, 520};
-            const int press[4] = {s.suctionPressure(bank), s.dischargePressure(bank), s.dischargePressure(bank) + 150, s.dischargePressure(bank) + 120};
-            auto put = [&](int offset, const QByteArray& text) {
-                if (base + offset + text.size() - 1 <= 1385 + 216 * 6 - 1)
-                    r.put(base + offset, text);
-            };
-            const bool odd = t == 0 && q.special;
-            for (int i = 0; i < 4; ++i) {
-                put(6 * i, r.number(odd ? q.special : fitted ? temps[i] : NotConnected, 6));
-                put(24 + 6 * i, r.number(odd ? q.special : fitted ? press[i] : NotConnected, 6));
-            }
-            put(48, r.number(fitted ? 40 * c.running : NotConnected, 6));
-            for (int i = 0; i < 16; ++i)
-                put(54 + i, (fitted && ((i == 0 && c.running) || (i == 6 && c.running >= c.units))) ? "1" : "0");
-            put(70, r.number(fitted ? 75 : NotConnected, 6));
-            put(76, "      ");
-            for (int i = 0; i < 8; ++i)
-                put(82 + i, "0");
-            if (t < 27 && q.torvanelKind[t] >= 0)
-                put(82, QByteArray::number(q.torvanelKind[t] % 10));
-            put(90, r.number(fitted ? 60 : NotConnected, 6));
-        }
-    }
+    if (v >= 6)
+        putTorvanelData(r, s);
     return r.text() + "presss";
 }
 

@@ -93,29 +93,10 @@ bool applyQuirk(InstrumentState& s, const QString& key, const QString& value, bo
     return true;
 }
 
-} // namespace
-
-QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
+// The instrument itself: what it reports and how fast it lives.
+bool applySetting(Instrument& instrument, const QString& key, const QString& value, bool& ok)
 {
-    QString line = rawLine.trimmed();
-    if (line.isEmpty() || line.startsWith(QLatin1Char('#')))
-        return {};
-    QString key, value;
-    const int eq = line.indexOf(QLatin1Char('='));
-    if (eq >= 0) {
-        key = line.left(eq).trimmed();
-        value = line.mid(eq + 1).trimmed();
-    } else {
-        const int sp = line.indexOf(QLatin1Char(' '));
-        key = sp < 0 ? line : line.left(sp);
-        value = sp < 0 ? QString() : line.mid(sp + 1).trimmed();
-    }
-    key = key.toLower().replace(QLatin1Char('-'), QLatin1Char('_'));
-    Faults& f = instrument.faults();
-    bool ok = true;
     auto number = [&]() { return value.toInt(&ok); };
-    auto flag = [&]() { return value.isEmpty() || value == QLatin1String("1") || value.toLower() == QLatin1String("on") || value.toLower() == QLatin1String("yes"); };
-
     if (key == QLatin1String("version")) {
         if (value.isEmpty())
             ok = false;
@@ -135,12 +116,30 @@ QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
             instrument.settings().speed = s;
         else
             ok = false;
-    } else if (key == QLatin1String("dial")) {
+    } else if (key == QLatin1String("brumalet_delay")) {
+        const int n = number();
+        if (ok)
+            instrument.settings().brumaletDelayMs = qMax(0, n);
+    } else {
+        return false;
+    }
+    return true;
+}
+
+// The faults of the line, switched on and off.
+bool applyFault(Instrument& instrument, const QString& key, const QString& value, bool& ok, QString* error)
+{
+    Faults& f = instrument.faults();
+    auto flag = [&]() { return value.isEmpty() || value == QLatin1String("1") || value.toLower() == QLatin1String("on") || value.toLower() == QLatin1String("yes"); };
+    auto number = [&]() { return value.toInt(&ok); };
+    if (key == QLatin1String("dial")) {
         QList<QByteArray> results;
         for (const QString& w : value.split(QLatin1Char(','), Qt::SkipEmptyParts)) {
             const QByteArray r = dialResult(w);
-            if (r.isEmpty())
-                return QStringLiteral("error: unknown dial result '%1'").arg(w.trimmed());
+            if (r.isEmpty()) {
+                *error = QStringLiteral("error: unknown dial result '%1'").arg(w.trimmed());
+                return true;
+            }
             results << r;
         }
         if (results.isEmpty())
@@ -177,14 +176,20 @@ QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
             ok = false;
         else
             f.wrongVersion = value.toLatin1();
-    } else if (key == QLatin1String("brumalet_delay")) {
-        const int n = number();
-        if (ok)
-            instrument.settings().brumaletDelayMs = qMax(0, n);
     } else if (key == QLatin1String("clear_faults")) {
         f = Faults();
         instrument.state().quirks = Quirks();
-    } else if (key == QLatin1String("reset")) {
+    } else {
+        return false;
+    }
+    return true;
+}
+
+// What happens to the instrument now, as a control command asks.
+bool applyControl(Instrument& instrument, const QString& key, const QString& value, bool& ok)
+{
+    auto number = [&]() { return value.toInt(&ok); };
+    if (key == QLatin1String("reset")) {
         instrument.reset();
     } else if (key == QLatin1String("drop_line")) {
         instrument.dropLine(value.isEmpty() ? 10000 : number());
@@ -202,6 +207,36 @@ QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
         ok = ok && ok2 && p.size() >= 2;
         if (ok)
             instrument.state().setTorvanelAlarm(s, i, p.value(2, QStringLiteral("1")) != QLatin1String("0"));
+    } else {
+        return false;
+    }
+    return true;
+}
+
+} // namespace
+
+QString applyScenarioLine(Instrument& instrument, const QString& rawLine)
+{
+    QString line = rawLine.trimmed();
+    if (line.isEmpty() || line.startsWith(QLatin1Char('#')))
+        return {};
+    QString key, value;
+    const int eq = line.indexOf(QLatin1Char('='));
+    if (eq >= 0) {
+        key = line.left(eq).trimmed();
+        value = line.mid(eq + 1).trimmed();
+    } else {
+        const int sp = line.indexOf(QLatin1Char(' '));
+        key = sp < 0 ? line : line.left(sp);
+        value = sp < 0 ? QString() : line.mid(sp + 1).trimmed();
+    }
+    key = key.toLower().replace(QLatin1Char('-'), QLatin1Char('_'));
+    bool ok = true;
+    QString error;
+    if (applySetting(instrument, key, value, ok) || applyFault(instrument, key, value, ok, &error)
+        || applyControl(instrument, key, value, ok)) {
+        if (!error.isEmpty())
+            return error;
     } else if (applyQuirk(instrument.state(), key, value, ok)) {
         // one of the odd replies
     } else {

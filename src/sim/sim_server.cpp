@@ -24,6 +24,9 @@ Server::Server(Instrument& instrument, QObject* parent) : QObject(parent), m_ins
             m_client->disconnectFromHost();
     });
     connect(&m_tick, &QTimer::timeout, this, &Server::tick);
+    m_wake.setSingleShot(true);
+    m_wake.setTimerType(Qt::PreciseTimer);
+    connect(&m_wake, &QTimer::timeout, this, &Server::tick);
 }
 
 Server::~Server() = default;
@@ -92,6 +95,17 @@ void Server::tick()
     const qint64 now = m_elapsed.elapsed();
     m_instrument.advance(now - m_last);
     m_last = now;
+    wakeForReply();
+}
+
+void Server::wakeForReply()
+{
+    const qint64 due = m_instrument.nextDue();
+    if (due < 0 || !m_tick.isActive())
+        return;
+    const qint64 wait = qMax<qint64>(1, due - m_last);
+    if (wait < m_tick.remainingTime() && (!m_wake.isActive() || wait < m_wake.remainingTime()))
+        m_wake.start(int(wait));
 }
 
 void Server::fromLine(const QByteArray& bytes)
@@ -100,6 +114,7 @@ void Server::fromLine(const QByteArray& bytes)
     // guard times are measured on the real clock.
     tick();
     m_instrument.receive(bytes);
+    wakeForReply();
 }
 
 void Server::toLine(const QByteArray& bytes)

@@ -34,6 +34,8 @@ public:
 
 private:
     void tick();
+    // A reply due before the next tick goes out on time, not on the tick.
+    void wakeForReply();
     void fromLine(const QByteArray& bytes);
     void toLine(const QByteArray& bytes);
     void readPty();
@@ -43,6 +45,7 @@ private:
     QElapsedTimer m_elapsed;
     qint64 m_last = 0;
     QTimer m_tick;
+    QTimer m_wake;
     std::unique_ptr<PtyPair> m_pty;
     QSocketNotifier* m_ptyNotifier = nullptr;
     QTcpServer* m_tcp = nullptr;

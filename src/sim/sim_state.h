@@ -1,6 +1,7 @@
 #pragma once
 
 #include "sim/sim_catalogue.h"
+#include "sim/sim_logs.h"
 
 #include <QByteArray>
 #include <QDateTime>
@@ -12,56 +13,14 @@
 
 namespace sim {
 
+// The demo plant's inputs, by channel: rooms under control, sensors and
+// pressure transducers. Every other channel is not connected.
+inline bool isRoom(int channel) { return channel >= 1 && channel <= 30; }
+inline bool isSensor(int channel) { return channel >= 101 && channel <= 110; }
+inline bool isPressureInput(int channel) { return channel >= 196 && channel <= 210; }
+
 // Special readings of an input, as every reply carries them.
 enum Special { NotConnected = -1000, OverRange = -1001, NoSensor = -1002, Unused1003 = -1003, LoadShed = -1004 };
-
-struct AlarmRecord {
-    int channel = 0; // 1..264: 1-200 rooms, 201-215 pressures, 216 liquid level, 217-264 digital
-    QByteArray description;
-    int kind = 0; // 1 high, 2 low
-    QDateTime time;
-    int value = 0;
-};
-
-struct HistoryRecord {
-    QDateTime time;
-    QVector<int> values; // 216 entries; a channel not logged holds NotLogged
-    static constexpr int NotLogged = -99999;
-};
-
-struct PowerRecord {
-    QDateTime end;
-    int seconds = 900;
-    int watts = 0;
-};
-
-// A log of the instrument: a ring of the last capacity records and the
-// mark of what has already gone up the line.
-template <typename T>
-struct Log {
-    QList<T> records;
-    int firstNew = 0;
-    int capacity = 500;
-    qint64 dropped = 0; // records that fell off the front, ever
-    void add(const T& r)
-    {
-        records.append(r);
-        while (records.size() > capacity) {
-            records.removeFirst();
-            firstNew = qMax(0, firstNew - 1);
-            ++dropped;
-        }
-    }
-    void clear()
-    {
-        dropped += records.size();
-        records.clear();
-        firstNew = 0;
-    }
-    // Everything up to end (counted as dropped + index) has gone up the line.
-    void markSent(qint64 end) { firstNew = int(qBound<qint64>(firstNew, end - dropped, records.size())); }
-    int newCount() const { return int(records.size()) - firstNew; }
-};
 
 struct RoomState {
     double value = 0;    // tenths, or the channel's unit
@@ -138,7 +97,7 @@ public:
     void countReset() { ++m_resets; }
     void setResets(int n) { m_resets = n; }
 
-    QDateTime now() const { return m_now; }
+    QDateTime now() const { return QDateTime::fromMSecsSinceEpoch(m_nowMs); }
     void advance(qint64 ms);
 
     // The set point table, row by wire channel.
@@ -199,19 +158,28 @@ public:
 
 private:
     void setCompressorKind(int row, int kind);
+    void readClock();
     void seed();
+    void seedChannel(int wire);
+    void seedGlobals();
+    void seedPlant();
     void step(double seconds);
     void minuteEvents();
     void logAlarm(int channel, int kind, int value);
     int activeSetPoint(int row) const;
     void stepPlantRoom(double dt);
+    void roomAlarms(int wire, int setPoint, double dt);
     double noise(double amplitude);
 
     Options m_options;
     QByteArray m_version;
     int m_resets = 0;
     QRandomGenerator m_rng;
-    QDateTime m_now;
+    // The clock as milliseconds, with the local minute of the day and day
+    // of the week read once a minute: local time is dear to compute.
+    qint64 m_nowMs = 0;
+    int m_minuteOfDay = 0;
+    int m_weekDay = 0; // Sunday 0
     qint64 m_carryMs = 0;
     std::array<std::array<int, Fields>, Channels> m_sp {};
     std::array<QByteArray, Channels> m_desc;

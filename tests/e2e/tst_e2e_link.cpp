@@ -30,7 +30,7 @@ struct Sim {
         process.write(line + '\n');
         process.waitForBytesWritten(1000);
         // The answer on stderr says the command was taken.
-        process.waitForReadyRead(500);
+        QVERIFY(QTest::qWaitFor([&] { return process.readAllStandardError().contains("ok: "); }, 5000));
     }
     ~Sim()
     {
@@ -251,8 +251,7 @@ void TestE2ELink::arrivalUnderAMessageIsHandled()
             return;
         // The call drops while the operator reads the message.
         pty.writeMaster("\r\nNO CARRIER\r\n");
-        // What arrived under the box is checked below, after it closes.
-        (void)QTest::qWaitFor([&] { return rig.op.messages().size() > 1; }, 5000);
+        QVERIFY(QTest::qWaitFor([&] { return rig.op.messages().size() > 1; }, 5000));
     });
     rig.engine.dial_num_Click();
     QCOMPARE(pty.readMaster(5000), QByteArray("ATX4DT5551234\r\n"));

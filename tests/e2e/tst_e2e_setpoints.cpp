@@ -44,7 +44,7 @@ struct Sim {
     {
         process.write(line + '\n');
         process.waitForBytesWritten(1000);
-        process.waitForReadyRead(500);
+        QVERIFY(QTest::qWaitFor([&] { return process.readAllStandardError().contains("ok: "); }, 5000));
     }
     ~Sim()
     {
