@@ -24,8 +24,8 @@ bool storeRecord(Recordset& sp, Recordset& info, const QString& record, int wire
             break;
         case ValueKind::Unchecked: {
             double n = 0;
-            if (!catalogue::numericValue(text, &n) || n < channel_record::kUncheckedMin
-                || n > channel_record::kUncheckedMax)
+            const channel_record::UncheckedRange range = channel_record::uncheckedRange(v.field);
+            if (!catalogue::numericValue(text, &n) || n < range.min || n > range.max)
                 return false;
             sp.setValue(v.field, catalogue::storeNumber(n));
             break;
