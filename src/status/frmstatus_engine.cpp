@@ -371,11 +371,11 @@ void frmstatus_engine::Cmdseldis_Click()
 
 void frmstatus_engine::Temp_Click(int index)
 {
-    if (index < 0 || index >= Rows || !setPointCard || !m_store)
+    if (index < 0 || index >= Rows || !m_views.setPointCard || !m_store)
         return;
     const int n = number(m_store->info(index, kInfoSelectedColumn));
     if (n > 0)
-        setPointCard(n);
+        m_views.setPointCard->showChannel(n);
 }
 
 // Tells only while an alarm blinks.

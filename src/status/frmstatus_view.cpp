@@ -267,7 +267,7 @@ void frmstatus_view::afterRefresh()
                 w->setVisible(false);
         }
     }
-    if (!m_e.setPointCard) {
+    if (!m_e.setPointCardAvailable()) {
         for (int i = 0; i < frmstatus_engine::Rows; ++i)
             findChild<QWidget*>(QStringLiteral("Temp_%1").arg(i))
                 ->setCursor(Qt::ArrowCursor);

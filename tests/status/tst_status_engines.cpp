@@ -24,6 +24,7 @@ private slots:
     void viewsToldOncePerProcedureAndBeforeEachBox_data();
     void viewsToldOncePerProcedureAndBeforeEachBox();
     void banksFollowANewCountOfChannels();
+    void valueShowsItsChannelsCard();
 };
 
 void tst_status_engines::statusRows()
@@ -300,6 +301,25 @@ void tst_status_engines::banksFollowANewCountOfChannels()
     e.redoBanks();
     QCOMPARE(e.bank[0].text, QStringLiteral("Bank 2"));
     QCOMPARE(e.bank[1].text, QStringLiteral("Bank 2"));
+}
+
+void tst_status_engines::valueShowsItsChannelsCard()
+{
+    struct Card : SetPointCardView {
+        void showChannel(int channel) override { shown.append(channel); }
+        QList<int> shown;
+    } card;
+    Rig r;
+    r.select({0, 150, 7});
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    e.Temp_Click(2);
+    QVERIFY(!e.setPointCardAvailable());
+    r.views.setPointCard = &card;
+    e.Temp_Click(0); // an empty row has no card
+    e.Temp_Click(2);
+    e.Temp_Click(1);
+    QCOMPARE(card.shown, (QList<int>{7, 150}));
 }
 
 QTEST_GUILESS_MAIN(tst_status_engines)
