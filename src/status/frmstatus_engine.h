@@ -77,22 +77,19 @@ public:
     void Temp_Click(int index);
     // The report of the 20 rows as they show now.
     void printgraph_Click(Printer& Printer);
-    void Changechannels();
-    void com_chan_visable();
-    void chanBanks();
-    void show_channel_rows();
-    void clear_pid_fan_labels();
-
-    InstrumentStore* store() { return m_store.get(); }
 
 signals:
     void changed();
 
 private:
+    void Changechannels();
+    void com_chan_visable();
+    void chanBanks();
+    void show_channel_rows();
+    void clear_pid_fan_labels();
     void Timer2_Timer();
     void readRows();
     QString channelCaption(int channel);
-    QVariant setpoint(int channel, int field);
 
     Link& m_link;
     Operator& m_op;

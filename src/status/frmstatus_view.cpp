@@ -249,8 +249,6 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     connect(clear, &QPushButton::clicked, &e, &frmstatus_engine::Command2_Click);
     connect(numbers, &QPushButton::clicked, &e, &frmstatus_engine::Cmdselchan_Click);
     connect(descriptions, &QPushButton::clicked, &e, &frmstatus_engine::Cmdseldis_Click);
-    // The printed report is not part of this view yet.
-    print->setEnabled(false);
     connect(&e, &frmstatus_engine::changed, this, &frmstatus_view::scheduleRefresh);
     refresh();
 }

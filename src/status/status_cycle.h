@@ -129,7 +129,6 @@ public:
     bool stale() const;
     // "Last reply 2 min 5 s ago" (empty before any reply).
     QString ageText() const;
-    qint64 lastReplyMs() const { return m_lastReply; }
 
     // Called at the end of Timer5's event (frmstatusp sends "t" from it).
     std::function<void()> afterFlash;
