@@ -96,6 +96,14 @@ public:
     virtual void status_do(const QString& datain) = 0;
 };
 
+// The set point card, reached from a channel's value in the status views.
+class SetPointCardView {
+public:
+    virtual ~SetPointCardView() = default;
+    // Unloads an open card and shows the card of this channel.
+    virtual void showChannel(int channel) = 0;
+};
+
 // MDIForm1 and the forms it owns that the line side touches.
 class ShellView {
 public:
@@ -135,6 +143,8 @@ struct OpenViews {
     TemperatureStatusView* multiprobes = nullptr;
 
     ShellView* shell = nullptr;
+    // Whoever can show the card; null while the program has none.
+    SetPointCardView* setPointCard = nullptr;
 
     bool anyOpen() const;
     // Every flag False (the pointers stay: their owner clears them as views unload).

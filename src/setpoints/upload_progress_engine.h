@@ -3,6 +3,7 @@
 // The small progress form `upload` of the channel transfers: a title, two
 // lines of text and a bar over the 216 channels.
 
+#include "platform/change_notifier.h"
 #include "platform/control_state.h"
 
 #include <QObject>
@@ -27,4 +28,7 @@ public:
 
 signals:
     void changed();
+
+private:
+    ChangeNotifier m_notify{[this] { emit changed(); }};
 };

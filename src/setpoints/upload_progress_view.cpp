@@ -1,6 +1,6 @@
 #include "setpoints/upload_progress_view.h"
 
-#include "platform/widget_control_state.h"
+#include "platform/widget_binder.h"
 #include "setpoints/upload_progress_engine.h"
 
 #include <QLabel>
@@ -23,15 +23,14 @@ upload_progress_view::upload_progress_view(upload_progress_engine& engine, QWidg
     layout->addWidget(m_label2);
     layout->addWidget(m_bar);
     setMinimumWidth(360);
-    connect(&engine, &upload_progress_engine::changed, this, &upload_progress_view::render);
-    render();
-}
-
-void upload_progress_view::render()
-{
-    setWindowTitle(m_engine.Caption.text);
-    applyControlState(m_engine.Label1, m_label1);
-    applyControlState(m_engine.Label2, m_label2);
-    applyControlState(m_engine.ProgressBar1, m_bar);
-    setVisible(m_engine.loaded);
+    auto* binder = new WidgetBinder(this);
+    binder->bind(engine.Label1, m_label1);
+    binder->bind(engine.Label2, m_label2);
+    binder->bind(engine.ProgressBar1, m_bar);
+    binder->setAfterRefresh([this] {
+        setWindowTitle(m_engine.Caption.text);
+        setVisible(m_engine.loaded);
+    });
+    connect(&engine, &upload_progress_engine::changed, binder, &WidgetBinder::scheduleRefresh);
+    binder->refresh();
 }

@@ -13,7 +13,6 @@ public:
     explicit upload_progress_view(upload_progress_engine& engine, QWidget* parent = nullptr);
 
 private:
-    void render();
     upload_progress_engine& m_engine;
     QLabel* m_label1;
     QLabel* m_label2;

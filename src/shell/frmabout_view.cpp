@@ -12,7 +12,7 @@
 #include <QSysInfo>
 #include <QVBoxLayout>
 
-frmAbout::frmAbout(QWidget* parent) : QDialog(parent)
+frmAbout_view::frmAbout_view(QWidget* parent) : QDialog(parent)
 {
     setObjectName(QStringLiteral("frmAbout"));
     setWindowTitle(QStringLiteral("Glacinor"));
@@ -42,12 +42,12 @@ frmAbout::frmAbout(QWidget* parent) : QDialog(parent)
     auto* buttons = new QDialogButtonBox(QDialogButtonBox::Ok, this);
     auto* info = buttons->addButton(tr("&System Info..."), QDialogButtonBox::ActionRole);
     info->setObjectName(QStringLiteral("cmdSysInfo"));
-    connect(info, &QPushButton::clicked, this, &frmAbout::cmdSysInfo_Click);
+    connect(info, &QPushButton::clicked, this, &frmAbout_view::cmdSysInfo_Click);
     connect(buttons, &QDialogButtonBox::accepted, this, &QDialog::accept);
     layout->addWidget(buttons);
 }
 
-QString frmAbout::systemInformation()
+QString frmAbout_view::systemInformation()
 {
     QStringList lines;
     lines << QStringLiteral("Program: Q-19 Workstation %1").arg(appVersionText());
@@ -59,7 +59,7 @@ QString frmAbout::systemInformation()
     return lines.join(QLatin1Char('\n'));
 }
 
-void frmAbout::cmdSysInfo_Click()
+void frmAbout_view::cmdSysInfo_Click()
 {
     sysInfo->setPlainText(systemInformation());
     sysInfo->setVisible(true);

@@ -7,10 +7,10 @@ class QPlainTextEdit;
 
 // The about box: the version, and on request the versions of what the
 // program runs on, for a service call.
-class frmAbout : public QDialog {
+class frmAbout_view : public QDialog {
     Q_OBJECT
 public:
-    explicit frmAbout(QWidget* parent = nullptr);
+    explicit frmAbout_view(QWidget* parent = nullptr);
     QLabel* lblVersion = nullptr;
     QPlainTextEdit* sysInfo = nullptr;
 

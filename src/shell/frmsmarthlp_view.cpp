@@ -6,7 +6,7 @@
 #include <QPushButton>
 #include <QVBoxLayout>
 
-frmsmarthlp::frmsmarthlp(frmsmarthlp_engine& engine, QWidget* parent)
+frmsmarthlp_view::frmsmarthlp_view(frmsmarthlp_engine& engine, QWidget* parent)
     : QWidget(parent, Qt::Tool | Qt::WindowStaysOnTopHint), m_engine(engine)
 {
     setObjectName(QStringLiteral("frmsmarthlp"));

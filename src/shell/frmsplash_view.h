@@ -6,9 +6,9 @@ class QLabel;
 
 // The window shown while the connection form loads its directory and the
 // selected instrument's data base.
-class frmSplash : public QWidget {
+class frmSplash_view : public QWidget {
     Q_OBJECT
 public:
-    explicit frmSplash(QWidget* parent = nullptr);
+    explicit frmSplash_view(QWidget* parent = nullptr);
     QLabel* lblVersion = nullptr;
 };

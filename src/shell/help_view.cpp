@@ -36,22 +36,22 @@ const TopicList& topicList()
 }
 } // namespace
 
-const QHash<QString, QString>& HelpWindow::topicPages()
+const QHash<QString, QString>& HelpView::topicPages()
 {
     return topicList().pages;
 }
 
-QStringList HelpWindow::topics()
+QStringList HelpView::topics()
 {
     return topicList().order;
 }
 
-QString HelpWindow::pageForTopic(const QString& topic)
+QString HelpView::pageForTopic(const QString& topic)
 {
     return topicPages().value(topic.trimmed());
 }
 
-HelpWindow::HelpWindow(QWidget* parent) : QWidget(parent, Qt::Window)
+HelpView::HelpView(QWidget* parent) : QWidget(parent, Qt::Window)
 {
     setObjectName(QStringLiteral("HelpWindow"));
     setWindowTitle(tr("Glacinor Help"));
@@ -86,7 +86,7 @@ HelpWindow::HelpWindow(QWidget* parent) : QWidget(parent, Qt::Window)
     resize(760, 600);
 }
 
-void HelpWindow::show_help(const QString& file, const QString& topic)
+void HelpView::show_help(const QString& file, const QString& topic)
 {
     Q_UNUSED(file); // every help file name opens the one book
     QString page = QStringLiteral("index.html");

@@ -8,10 +8,10 @@ class QLabel;
 
 // The program's help: HTML pages shipped inside the program, one per topic,
 // shown in a browser window with contents, back and forward.
-class HelpWindow : public QWidget {
+class HelpView : public QWidget {
     Q_OBJECT
 public:
-    explicit HelpWindow(QWidget* parent = nullptr);
+    explicit HelpView(QWidget* parent = nullptr);
 
     // Opens the help book. With a topic, opens that topic's page; an unknown
     // topic opens the contents and says which topic was asked for. The file

@@ -114,7 +114,7 @@ int main(int argc, char* argv[])
                                                      : DataFolder::location();
     DataFolder folder(folderPath);
 
-    auto* splash = new frmSplash;
+    auto* splash = new frmSplash_view;
     splash->show();
     app.processEvents();
 
@@ -136,7 +136,7 @@ int main(int argc, char* argv[])
     OpenViews views;
     LinkGlobals globals;
 
-    MDIForm1 mainWindow(views, globals);
+    MDIForm1_view mainWindow(views, globals);
     op.setParentWidget(&mainWindow);
 
     ccForm1_engine* lineEngine = nullptr;

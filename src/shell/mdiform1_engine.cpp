@@ -65,6 +65,7 @@ int MDIForm1_engine::openView() const
 
 void MDIForm1_engine::MDIForm_Load()
 {
+    const auto p = m_notify.procedure();
     m_views.closeAll();
     m_globals.link_up = false;
     m_globals.smart_help_open = false;
@@ -85,7 +86,6 @@ void MDIForm1_engine::MDIForm_Load()
             }
         }
     }
-    emit changed();
 }
 
 void MDIForm1_engine::setChecks(ViewId id, bool on)
@@ -113,11 +113,14 @@ void MDIForm1_engine::close_others_for(ViewId id)
 
 void MDIForm1_engine::mnuon_Click(ViewId id)
 {
+    const auto p = m_notify.procedure();
     if (!m_host.available(id))
         return;
     if (!flag(id)) {
         flag(id) = true;
         close_others_for(id);
+        // A view whose data base fails says so in a box.
+        m_notify.flush();
         m_host.load(id);
     }
     // The load may have failed and closed everything again (dbase_error).
@@ -125,33 +128,33 @@ void MDIForm1_engine::mnuon_Click(ViewId id)
         m_host.maximise(id);
         setChecks(id, true);
     }
-    emit changed();
 }
 
 void MDIForm1_engine::mnuoff_Click(ViewId id)
 {
+    const auto p = m_notify.procedure();
     if (flag(id))
         m_host.unload(id);
     flag(id) = false;
     setChecks(id, false);
     if (!m_views.anyOpen())
         m_host.showConnectionForm();
-    emit changed();
 }
 
 void MDIForm1_engine::viewUnloaded(ViewId id)
 {
+    const auto p = m_notify.procedure();
     if (!flag(id))
         return;
     flag(id) = false;
     setChecks(id, false);
     if (!m_views.anyOpen())
         m_host.showConnectionForm();
-    emit changed();
 }
 
 void MDIForm1_engine::mnualloff_Click()
 {
+    const auto p = m_notify.procedure();
     m_globals.link_up = false;
     for (const ViewInfo& v : viewCatalog()) {
         if (flag(v.id))
@@ -162,11 +165,11 @@ void MDIForm1_engine::mnualloff_Click()
     if (m_link)
         m_link->hangUp();
     m_host.showConnectionForm();
-    emit changed();
 }
 
 void MDIForm1_engine::toolbar_ButtonClick(const QString& key)
 {
+    const auto p = m_notify.procedure();
     if (key == QLatin1String("tlbccform1on")) {
         mnualloff_Click();
         return;
@@ -186,18 +189,20 @@ void MDIForm1_engine::toolbar_ButtonClick(const QString& key)
 
 void MDIForm1_engine::mnuexit_Click()
 {
-    for (ViewId id : exitOrder()) {
-        if (flag(id))
-            unloadView(id);
+    {
+        const auto p = m_notify.procedure();
+        for (ViewId id : exitOrder()) {
+            if (flag(id))
+                unloadView(id);
+        }
     }
-    emit changed();
     emit quitRequested();
 }
 
 void MDIForm1_engine::setToolbarEnabled(bool on)
 {
+    const auto p = m_notify.procedure();
     Toolbar1.enabled = on;
-    emit changed();
 }
 
 void MDIForm1_engine::unloadUploadProgress()

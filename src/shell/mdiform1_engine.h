@@ -1,6 +1,7 @@
 #pragma once
 
 #include "link/open_views.h"
+#include "platform/change_notifier.h"
 #include "platform/control_state.h"
 #include "shell/view_catalog.h"
 
@@ -94,4 +95,5 @@ private:
     LinkGlobals& m_globals;
     ViewHost& m_host;
     Link* m_link = nullptr;
+    ChangeNotifier m_notify{[this] { emit changed(); }};
 };

@@ -16,7 +16,7 @@
 #include <QToolBar>
 #include <QWhatsThis>
 
-MDIForm1::MDIForm1(OpenViews& views, LinkGlobals& globals, QWidget* parent)
+MDIForm1_view::MDIForm1_view(OpenViews& views, LinkGlobals& globals, QWidget* parent)
     : QMainWindow(parent), m_views(views), m_engine(views, globals, *this)
 {
     setObjectName(QStringLiteral("MDIForm1"));
@@ -29,7 +29,7 @@ MDIForm1::MDIForm1(OpenViews& views, LinkGlobals& globals, QWidget* parent)
     setCentralWidget(m_area);
     buildToolbar();
     buildMenus();
-    connect(&m_engine, &MDIForm1_engine::changed, this, &MDIForm1::refresh);
+    connect(&m_engine, &MDIForm1_engine::changed, this, &MDIForm1_view::refresh);
     connect(&m_engine, &MDIForm1_engine::quitRequested, this, [this] {
         m_exiting = true;
         close();
@@ -42,7 +42,7 @@ MDIForm1::MDIForm1(OpenViews& views, LinkGlobals& globals, QWidget* parent)
     qApp->installEventFilter(this);
 }
 
-MDIForm1::~MDIForm1()
+MDIForm1_view::~MDIForm1_view()
 {
     // The views' windows go with the area after this object's members: they
     // must not report their unloading to an engine that has gone.
@@ -51,7 +51,7 @@ MDIForm1::~MDIForm1()
         sub->disconnect(this);
 }
 
-void MDIForm1::buildToolbar()
+void MDIForm1_view::buildToolbar()
 {
     m_toolbar = addToolBar(QStringLiteral("Toolbar1"));
     m_toolbar->setObjectName(QStringLiteral("Toolbar1"));
@@ -70,7 +70,7 @@ void MDIForm1::buildToolbar()
     }
 }
 
-void MDIForm1::buildMenus()
+void MDIForm1_view::buildMenus()
 {
     QMenu* view = menuBar()->addMenu(QStringLiteral("&View"));
     view->setObjectName(QStringLiteral("mnuview"));
@@ -115,17 +115,17 @@ void MDIForm1::buildMenus()
     viewHelp->setObjectName(QStringLiteral("mnuhelpview"));
     viewHelp->setShortcut(QKeySequence::HelpContents);
     viewHelp->setShortcutContext(Qt::ApplicationShortcut);
-    connect(viewHelp, &QAction::triggered, this, &MDIForm1::showContextHelp);
+    connect(viewHelp, &QAction::triggered, this, &MDIForm1_view::showContextHelp);
     auto* whatsThisItem = helpMenu->addAction(QStringLiteral("Whats this help"));
     whatsThisItem->setObjectName(QStringLiteral("mnuwhatsthis"));
     whatsThisItem->setShortcut(QKeySequence::WhatsThis);
-    connect(whatsThisItem, &QAction::triggered, this, &MDIForm1::whatsThis);
+    connect(whatsThisItem, &QAction::triggered, this, &MDIForm1_view::whatsThis);
     auto* about = helpMenu->addAction(QStringLiteral("About Glacinor"));
     about->setObjectName(QStringLiteral("mnuabout"));
-    connect(about, &QAction::triggered, this, &MDIForm1::mnuabout_Click);
+    connect(about, &QAction::triggered, this, &MDIForm1_view::mnuabout_Click);
 }
 
-void MDIForm1::refresh()
+void MDIForm1_view::refresh()
 {
     for (int i = 0; i < kViewCount; ++i) {
         for (auto [action, state] : {std::pair{m_on[i], &m_engine.mnuon[i]}, std::pair{m_off[i], &m_engine.mnuoff[i]}}) {
@@ -143,7 +143,7 @@ void MDIForm1::refresh()
         m->setToolTipsVisible(true);
 }
 
-void MDIForm1::setConnectionForm(QWidget* ccForm1)
+void MDIForm1_view::setConnectionForm(QWidget* ccForm1)
 {
     m_connection = m_area->addSubWindow(ccForm1, Qt::SubWindow | Qt::WindowTitleHint);
     m_connection->setObjectName(QStringLiteral("ccForm1Window"));
@@ -152,19 +152,19 @@ void MDIForm1::setConnectionForm(QWidget* ccForm1)
     showConnectionForm();
 }
 
-void MDIForm1::registerView(ViewId id, ViewFactory factory)
+void MDIForm1_view::registerView(ViewId id, ViewFactory factory)
 {
     m_factories.insert(int(id), std::move(factory));
 }
 
-HelpWindow* MDIForm1::help()
+HelpView* MDIForm1_view::help()
 {
     if (!m_help)
-        m_help = new HelpWindow(this);
+        m_help = new HelpView(this);
     return m_help;
 }
 
-void MDIForm1::showContextHelp()
+void MDIForm1_view::showContextHelp()
 {
     QString topic = kConnectionHelpTopic;
     const QMdiSubWindow* front = m_area->activeSubWindow();
@@ -175,7 +175,7 @@ void MDIForm1::showContextHelp()
     help()->show_help(QStringLiteral("q-19.chm"), topic);
 }
 
-bool MDIForm1::eventFilter(QObject* watched, QEvent* event)
+bool MDIForm1_view::eventFilter(QObject* watched, QEvent* event)
 {
     if (event->type() != QEvent::WhatsThis && event->type() != QEvent::QueryWhatsThis)
         return QMainWindow::eventFilter(watched, event);
@@ -193,12 +193,12 @@ bool MDIForm1::eventFilter(QObject* watched, QEvent* event)
     return true;
 }
 
-bool MDIForm1::available(ViewId id) const
+bool MDIForm1_view::available(ViewId id) const
 {
     return m_factories.contains(int(id));
 }
 
-void MDIForm1::load(ViewId id)
+void MDIForm1_view::load(ViewId id)
 {
     const auto f = m_factories.find(int(id));
     if (f == m_factories.end() || m_open.contains(int(id)))
@@ -219,7 +219,7 @@ void MDIForm1::load(ViewId id)
     sub->show();
 }
 
-void MDIForm1::unload(ViewId id)
+void MDIForm1_view::unload(ViewId id)
 {
     if (QMdiSubWindow* sub = m_open.take(int(id))) {
         sub->disconnect(this);
@@ -227,7 +227,7 @@ void MDIForm1::unload(ViewId id)
     }
 }
 
-void MDIForm1::maximise(ViewId id)
+void MDIForm1_view::maximise(ViewId id)
 {
     if (QMdiSubWindow* sub = m_open.value(int(id))) {
         sub->showMaximized();
@@ -235,7 +235,7 @@ void MDIForm1::maximise(ViewId id)
     }
 }
 
-void MDIForm1::showConnectionForm()
+void MDIForm1_view::showConnectionForm()
 {
     if (!m_connection)
         return;
@@ -244,7 +244,7 @@ void MDIForm1::showConnectionForm()
     m_area->setActiveSubWindow(m_connection);
 }
 
-void MDIForm1::unloadUploadProgress()
+void MDIForm1_view::unloadUploadProgress()
 {
     if (m_uploadProgress) {
         m_uploadProgress->close();
@@ -252,23 +252,23 @@ void MDIForm1::unloadUploadProgress()
     }
 }
 
-void MDIForm1::whatsThis()
+void MDIForm1_view::whatsThis()
 {
     QWhatsThis::enterWhatsThisMode();
 }
 
-void MDIForm1::showHelpContents()
+void MDIForm1_view::showHelpContents()
 {
     help()->show_help(QStringLiteral("q-19.chm"));
 }
 
-void MDIForm1::mnuabout_Click()
+void MDIForm1_view::mnuabout_Click()
 {
-    frmAbout about(this);
+    frmAbout_view about(this);
     about.exec();
 }
 
-void MDIForm1::closeEvent(QCloseEvent* event)
+void MDIForm1_view::closeEvent(QCloseEvent* event)
 {
     if (!m_exiting) {
         m_exiting = true;

@@ -10,7 +10,7 @@ class QMdiArea;
 class QMdiSubWindow;
 class QAction;
 class QToolBar;
-class HelpWindow;
+class HelpView;
 
 // Makes one view: its engine (registered in the routing table by the
 // factory) and its window. The window owns the engine; deleting the window
@@ -19,17 +19,17 @@ using ViewFactory = std::function<QWidget*(OpenViews& views)>;
 
 // The main window: the connection form and at most one view, the "&View",
 // "Close", "Window" and help menus, and the toolbar.
-class MDIForm1 : public QMainWindow, public ViewHost {
+class MDIForm1_view : public QMainWindow, public ViewHost {
     Q_OBJECT
 public:
-    MDIForm1(OpenViews& views, LinkGlobals& globals, QWidget* parent = nullptr);
-    ~MDIForm1() override;
+    MDIForm1_view(OpenViews& views, LinkGlobals& globals, QWidget* parent = nullptr);
+    ~MDIForm1_view() override;
 
     MDIForm1_engine& engine() { return m_engine; }
     // The connection form, shown whenever no view is open.
     void setConnectionForm(QWidget* ccForm1);
     void registerView(ViewId id, ViewFactory factory);
-    HelpWindow* help();
+    HelpView* help();
     // F1: the help page of the view in front, or of the connection form.
     void showContextHelp();
 
@@ -68,7 +68,7 @@ private:
     QList<QAction*> m_on;
     QList<QAction*> m_off;
     QList<QAction*> m_tools;
-    HelpWindow* m_help = nullptr;
+    HelpView* m_help = nullptr;
     QWidget* m_uploadProgress = nullptr;
     bool m_exiting = false;
 };

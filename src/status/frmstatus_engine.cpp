@@ -3,11 +3,12 @@
 #include "link/link.h"
 #include "link/link_globals.h"
 #include "platform/operator.h"
-#include "platform/printer.h"
 #include "setpoints/catalogue.h"
 #include "setpoints/instrument_store.h"
 #include "setpoints/view_store.h"
 #include "status/status_codec.h"
+
+#include <algorithm>
 
 namespace {
 
@@ -74,11 +75,11 @@ frmstatus_engine::~frmstatus_engine()
 
 bool frmstatus_engine::Form_Load(const QString& instrumentId, const QString& storePath)
 {
+    const auto p = cycle.notify.procedure();
     m_views.status_open = true;
     cycle.Text10[0].text = instrumentId;
     m_store = openViewStore(storePath, m_op, m_link);
     if (!m_store) {
-        emit changed();
         return false;
     }
     cycle.loadInterval(m_store.get());
@@ -118,7 +119,6 @@ bool frmstatus_engine::Form_Load(const QString& instrumentId, const QString& sto
     }
     com_chan_visable();
     cycle.firstRequest();
-    emit changed();
     return true;
 }
 
@@ -182,12 +182,12 @@ void frmstatus_engine::show_channel_rows()
 
 void frmstatus_engine::redoBanks()
 {
+    const auto p = cycle.notify.procedure();
     if (!m_store)
         return;
     for (int b = 0; b < kBanks; ++b)
         m_bankSize[b] = number(m_store->setpoint(0, kBankSizeFirstField + b));
     chanBanks();
-    emit changed();
 }
 
 void frmstatus_engine::chanBanks()
@@ -237,6 +237,7 @@ void frmstatus_engine::status_do()
 
 void frmstatus_engine::status_do(const QString& reply)
 {
+    const auto p = cycle.notify.procedure();
     using namespace status_layout;
     cycle.replyStarted(reply);
     const double version = m_link.globals().versionNumber();
@@ -298,11 +299,11 @@ void frmstatus_engine::status_do(const QString& reply)
     for (int k = 0; k < Pressures; ++k)
         TempP[k].text = r.hasPressures ? pressureBoxText(r.pressure[k]) : QStringLiteral("N/A");
     cycle.replyFinished();
-    emit changed();
 }
 
 void frmstatus_engine::Command1_Click(int index)
 {
+    const auto p = cycle.notify.procedure();
     if (index < 1 || index > Buttons || !m_store)
         return;
     if (Command1[index].backColor == Selected) {
@@ -320,13 +321,12 @@ void frmstatus_engine::Command1_Click(int index)
                 free = i;
         }
         if (free < 0) {
-            emit changed();
+            cycle.notify.flush();
             m_op.message(QStringLiteral("Channel Display Full"),
                          {QStringLiteral("There is already 20 channels (maximum) selected,"),
                           QStringLiteral("De select at least 1 channel by clicking on the channel number."),
                           QStringLiteral("Then select the new channel number to display.")});
             show_channel_rows();
-            emit changed();
             return;
         }
         m_store->setInfo(free, kInfoSelectedColumn, index);
@@ -334,11 +334,11 @@ void frmstatus_engine::Command1_Click(int index)
         Command1[index].backColor = Selected;
     }
     show_channel_rows();
-    emit changed();
 }
 
 void frmstatus_engine::Command2_Click()
 {
+    const auto p = cycle.notify.procedure();
     for (int n = 1; n <= Buttons; ++n) {
         if (Command1[n].backColor != Off)
             Command1[n].backColor = Off;
@@ -349,78 +349,44 @@ void frmstatus_engine::Command2_Click()
         m_rows[i] = 0;
     }
     show_channel_rows();
-    emit changed();
 }
 
 void frmstatus_engine::Cmdselchan_Click()
 {
+    const auto p = cycle.notify.procedure();
     showDescriptions = false;
     Changechannels();
     if (m_store)
         m_store->setInfo(kInfoDisplayModeRow, kInfoDisplayModeColumn, 0);
-    emit changed();
 }
 
 void frmstatus_engine::Cmdseldis_Click()
 {
+    const auto p = cycle.notify.procedure();
     showDescriptions = true;
     Changechannels();
     if (m_store)
         m_store->setInfo(kInfoDisplayModeRow, kInfoDisplayModeColumn, 1);
-    emit changed();
 }
 
 void frmstatus_engine::Temp_Click(int index)
 {
-    if (index < 0 || index >= Rows || !setPointCard || !m_store)
+    if (index < 0 || index >= Rows || !m_views.setPointCard || !m_store)
         return;
     const int n = number(m_store->info(index, kInfoSelectedColumn));
     if (n > 0)
-        setPointCard(n);
+        m_views.setPointCard->showChannel(n);
 }
 
+// Tells only while an alarm blinks.
 void frmstatus_engine::Timer2_Timer()
 {
-    bool any = false;
+    const auto lit = [](const ControlState& a) { return a.backColor != Off; };
+    if (std::none_of(std::begin(alarm), std::end(alarm), lit))
+        return;
+    const auto p = cycle.notify.procedure();
     for (ControlState& a : alarm) {
-        if (a.backColor == Off)
-            continue;
-        a.backColor = a.backColor == PaleRed ? Colour::Yellow : PaleRed;
-        any = true;
+        if (lit(a))
+            a.backColor = a.backColor == PaleRed ? Colour::Yellow : PaleRed;
     }
-    if (any)
-        emit changed();
-}
-
-void frmstatus_engine::printgraph_Click(Printer& Printer)
-{
-    cycle.printHead(Printer, QStringLiteral("Velmark Instruments Glacinor Current Temperature Status"));
-    const auto onOff = [](const ControlState& c) { return c.backColor == Off ? QStringLiteral("OFF") : QStringLiteral("ON"); };
-    Printer.line(QStringLiteral("Chan No."), {{13, QStringLiteral("Bank No.")},
-                                              {26, QStringLiteral("Channels Temp")},
-                                              {43, QStringLiteral("Chan Assoc 1")},
-                                              {59, QStringLiteral("Chan Assoc 2")},
-                                              {75, QStringLiteral("Chan Assoc 3")},
-                                              {91, QStringLiteral("Liquid Sol")},
-                                              {105, QStringLiteral("Fans Contactor")},
-                                              {123, QStringLiteral("Defrost Sol")},
-                                              {138, QStringLiteral("Suction Sol")},
-                                              {153, QStringLiteral("PID sol")},
-                                              {164, QStringLiteral("Alarm")}});
-    Printer.endLine();
-    // Hidden rows are printed too; either phase of the blink prints "YES".
-    for (int i = 0; i < Rows; ++i) {
-        Printer.line(chanframe[i].text, {{13, bank[i].text},
-                                         {26, Temp[i].text},
-                                         {43, assoc1[i].text},
-                                         {59, assoc2[i].text},
-                                         {75, assoc3[i].text},
-                                         {91, onOff(liquid[i])},
-                                         {105, onOff(fans[i])},
-                                         {123, onOff(defrost[i])},
-                                         {138, onOff(suction[i])},
-                                         {153, onOff(pid[i])},
-                                         {164, alarm[i].backColor == Off ? QStringLiteral("NO") : QStringLiteral("YES")}});
-    }
-    Printer.endDoc();
 }

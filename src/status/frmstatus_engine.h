@@ -9,7 +9,6 @@
 #include "status/status_cycle.h"
 
 #include <QObject>
-#include <functional>
 #include <memory>
 
 class Link;
@@ -60,8 +59,8 @@ public:
     // The channel shown in each display row (info rows 0..19, field 7).
     int rowChannel(int row) const { return m_rows[row]; }
 
-    // Opens the set point card on a channel; unset while that view does not exist.
-    std::function<void(int channel)> setPointCard;
+    // Whether a click on a value can show the set point card.
+    bool setPointCardAvailable() const { return m_views.setPointCard != nullptr; }
 
     // --- TemperatureStatusView ---
     void status_do() override;
@@ -78,22 +77,19 @@ public:
     void Temp_Click(int index);
     // The report of the 20 rows as they show now.
     void printgraph_Click(Printer& Printer);
-    void Changechannels();
-    void com_chan_visable();
-    void chanBanks();
-    void show_channel_rows();
-    void clear_pid_fan_labels();
-
-    InstrumentStore* store() { return m_store.get(); }
 
 signals:
     void changed();
 
 private:
+    void Changechannels();
+    void com_chan_visable();
+    void chanBanks();
+    void show_channel_rows();
+    void clear_pid_fan_labels();
     void Timer2_Timer();
     void readRows();
     QString channelCaption(int channel);
-    QVariant setpoint(int channel, int field);
 
     Link& m_link;
     Operator& m_op;

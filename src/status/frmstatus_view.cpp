@@ -13,69 +13,7 @@
 #include <QScrollArea>
 #include <QSpinBox>
 #include <QTabWidget>
-#include <QTimer>
 #include <QVBoxLayout>
-
-void StatusViewBase::bind(const ControlState& state, QWidget* w, bool data)
-{
-    m_bindings.append({&state, w, data});
-}
-
-void StatusViewBase::bindInterval(StatusCycle& cycle, QSpinBox* spinner)
-{
-    m_cycle = &cycle;
-    m_interval = spinner;
-    spinner->setRange(StatusCycle::IntervalMin, StatusCycle::SpinnerMax);
-    bind(cycle.UpDown1, spinner);
-    connect(spinner, &QSpinBox::valueChanged, this, [this](int value) {
-        if (!m_refreshing && m_cycle->UpDown1.value.toInt() != value)
-            m_cycle->UpDown1_Change(value);
-    });
-}
-
-void StatusViewBase::unitTip(QWidget* w, const QString& tip)
-{
-    m_unitTips.append({w, tip});
-    w->setToolTip(tip);
-}
-
-void StatusViewBase::scheduleRefresh()
-{
-    // Replies arrive in batches and timers fire in bursts: one redraw per burst.
-    if (!m_timer) {
-        m_timer = new QTimer(this);
-        m_timer->setSingleShot(true);
-        m_timer->setInterval(20);
-        connect(m_timer, &QTimer::timeout, this, &StatusViewBase::refresh);
-    }
-    if (!m_timer->isActive())
-        m_timer->start();
-}
-
-void StatusViewBase::refresh()
-{
-    const bool old = stale();
-    const QString age = old ? ageText() : QString();
-    // Showing the engine's state is no step of the operator's: nothing the
-    // widgets signal meanwhile may be written back.
-    m_refreshing = true;
-    if (m_interval)
-        m_interval->setMaximum(qMax(int(StatusCycle::SpinnerMax), m_cycle->UpDown1.value.toInt()));
-    for (const Binding& b : m_bindings) {
-        applyControlState(*b.state, b.widget);
-        if (b.data && old) {
-            b.widget->setEnabled(false);
-            b.widget->setToolTip(age);
-        }
-    }
-    for (const auto& [w, tip] : std::as_const(m_unitTips)) {
-        const QString now = w->toolTip();
-        if (!now.startsWith(tip))
-            w->setToolTip(now.isEmpty() ? tip : tip + QLatin1Char('\n') + now);
-    }
-    m_refreshing = false;
-    afterRefresh();
-}
 
 namespace {
 
@@ -110,7 +48,7 @@ QString indexed(const char* name, int i)
 
 } // namespace
 
-frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusViewBase(parent), m_e(e)
+frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusViewBase(e.cycle, parent), m_e(e)
 {
     setObjectName(QStringLiteral("frmstatus"));
     setWindowTitle(QStringLiteral("Current Status Temperature"));
@@ -163,7 +101,7 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     bind(c.Text10[0], id);
     bind(c.Text10[1], intervalText);
     bind(c.Text10[2], time);
-    bindInterval(c, interval);
+    bindInterval(interval);
     bind(c.nowstatus, now);
     bind(c.startstatus, start);
     bind(c.stopstatus, stop);
@@ -311,20 +249,8 @@ frmstatus_view::frmstatus_view(frmstatus_engine& e, QWidget* parent) : StatusVie
     connect(clear, &QPushButton::clicked, &e, &frmstatus_engine::Command2_Click);
     connect(numbers, &QPushButton::clicked, &e, &frmstatus_engine::Cmdselchan_Click);
     connect(descriptions, &QPushButton::clicked, &e, &frmstatus_engine::Cmdseldis_Click);
-    // The printed report is not part of this view yet.
-    print->setEnabled(false);
     connect(&e, &frmstatus_engine::changed, this, &frmstatus_view::scheduleRefresh);
     refresh();
-}
-
-bool frmstatus_view::stale() const
-{
-    return m_e.cycle.stale();
-}
-
-QString frmstatus_view::ageText() const
-{
-    return m_e.cycle.ageText();
 }
 
 void frmstatus_view::afterRefresh()
@@ -339,7 +265,7 @@ void frmstatus_view::afterRefresh()
                 w->setVisible(false);
         }
     }
-    if (!m_e.setPointCard) {
+    if (!m_e.setPointCardAvailable()) {
         for (int i = 0; i < frmstatus_engine::Rows; ++i)
             findChild<QWidget*>(QStringLiteral("Temp_%1").arg(i))
                 ->setCursor(Qt::ArrowCursor);

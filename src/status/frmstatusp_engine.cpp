@@ -4,7 +4,6 @@
 #include "link/link.h"
 #include "link/link_globals.h"
 #include "platform/operator.h"
-#include "platform/printer.h"
 #include "setpoints/instrument_store.h"
 #include "setpoints/view_store.h"
 
@@ -16,45 +15,12 @@ constexpr int kBanksInUseField = 83;
 constexpr int kCompressorKindField = 165;
 constexpr int kEqualizerField = 167;
 constexpr int kCondenserKindField = 169;
-
 const QString kUnknown = QStringLiteral("????");
 
 int number(const QVariant& v)
 {
     return int(replyfield::val(v.toString()));
 }
-
-QString yesNo(bool on)
-{
-    return on ? QStringLiteral("YES") : QStringLiteral("NO");
-}
-
-QString onOff(bool on)
-{
-    return on ? QStringLiteral("ON") : QStringLiteral("OFF");
-}
-
-// Label sets of the two kinds of Torvanel: 1 a recip, others a screw.
-const char* const kScrewLabels[frmstatusp_engine::PanelBoxes] = {
-    "Suction Temp", "Discharge Temp", "Oil Manifold Temp", "Oil Seperator Temp",
-    "Suction Press", "Discharge Press", "Oil Manifold Press", "Oil Pre Filter",
-    "Load Slide %", "Volume Ratio %", "Motor Current",
-    "Remote Run", "Remote Off", "Emergency Switch", "Full Load Switch", "Full Unload Switch",
-    "Motor Auxilary", "Oil Level Switch", "Auxilary 1", "Load Solenoid", "Unload Solenoid", "Oil Pump",
-    "Compressor", "Running", "In Alarm",
-    "Oil Heater", "Vi Increase", "Vi Decrease", "Start Contactor", "Run Contactor",
-    "Fully Loaded", "Fully Unloaded", "Spare 1", "Spare 2", "Spare 3",
-};
-const char* const kRecipLabels[frmstatusp_engine::PanelBoxes] = {
-    "Suction Temp", "Discharge Temp", "Oil Manifold Temp", "Intermediate Temp",
-    "Suction Press", "Discharge Press", "Oil Pressure", "Intermediate Press",
-    "Motor Current", "Super Heat", "Spare Analogue",
-    "Remote Run Switch", "Remote Off Switch", "Motor Auxillary", "Water Jacket Flow", "Emergency Switch",
-    "Stage 1 Solenoid", "Stage 2 Solenoid", "Stage 3 Solenoid", "Stage 4 Solenoid", "Oil Pump", "Crankcase Heater",
-    "Compressor", "Running", "In Alarm",
-    "Spare Input 1", "Spare Input 2", "Spare Input 3", "Spare Input 4", "Spare Input 5",
-    "Fully Loaded", "Spare 1", "Spare 2", "Spare 3", "Spare 4",
-};
 
 } // namespace
 
@@ -129,18 +95,17 @@ QVariant frmstatusp_engine::setpoint(int row, int field)
 
 bool frmstatusp_engine::Form_Load(const QString& instrumentId, const QString& storePath)
 {
+    const auto p = cycle.notify.procedure();
     m_views.statusp_open = true;
     cycle.Text10[0].text = instrumentId;
     m_store = openViewStore(storePath, m_op, m_link);
     if (!m_store) {
-        emit changed();
         return false;
     }
     cycle.loadInterval(m_store.get());
     chanBanks();
     stages();
     cycle.firstRequest();
-    emit changed();
     return true;
 }
 
@@ -228,6 +193,7 @@ void frmstatusp_engine::statusp_do()
 
 void frmstatusp_engine::statusp_do(const QString& reply)
 {
+    const auto p = cycle.notify.procedure();
     cycle.replyStarted(reply);
     const double version = m_link.globals().versionNumber();
     const PresssReply r = decodePresss(reply, version);
@@ -334,192 +300,4 @@ void frmstatusp_engine::statusp_do(const QString& reply)
         show_torvanel_data();
     show_alarm_words();
     cycle.replyFinished();
-    emit changed();
-}
-
-void frmstatusp_engine::afterFlash()
-{
-    if (m_link.globals().versionNumber() >= presss_layout::TorvanelRequestVersion)
-        send_torvanel_request();
-}
-
-void frmstatusp_engine::send_torvanel_request()
-{
-    if (m_link.globals().link_up)
-        m_link.Output(commands::torvanelRequest());
-    m_link.startWaitUd();
-}
-
-void frmstatusp_engine::statuspa_do()
-{
-    statuspa_do(m_link.test3Text());
-}
-
-void frmstatusp_engine::statuspa_do(const QString& reply)
-{
-    const double version = m_link.globals().versionNumber();
-    if (version < presss_layout::TorvanelRequestVersion)
-        return;
-    cycle.releaseManualWait();
-    CsAlarms = reply;
-    show_alarm_words();
-    if (version >= presss_layout::TorvanTemperatureVersion) {
-        for (int i = 0; i < presss_layout::TorvanTemperatures; ++i)
-            Temp[i].text = torvanTemperature(reply, i);
-    }
-    cycle.restartWatchdog();
-    cycle.Timer5.setEnabled(false);
-    emit changed();
-}
-
-void frmstatusp_engine::labelPanel(int kind)
-{
-    const char* const* labels = kind == 1 ? kRecipLabels : kScrewLabels;
-    for (int i = 0; i < PanelBoxes; ++i)
-        Label10[i].text = QString::fromLatin1(labels[i]);
-}
-
-void frmstatusp_engine::show_torvanel_data()
-{
-    const TorvanelBlock b = decodeTorvanelBlock(CsData, selected);
-    if (!b.known || CsData == CsDataInitial) {
-        for (ControlState& t : Text3)
-            t.text = kUnknown;
-        labelPanel(0);
-        return;
-    }
-    labelPanel(b.kind);
-    for (int i = 0; i < presss_layout::BlockTemperatures; ++i)
-        Text3[PanelTemperature + i].text = b.temperatures[i];
-    for (int i = 0; i < presss_layout::BlockPressures; ++i)
-        Text3[PanelPressure + i].text = b.pressures[i];
-    Text3[PanelAnalogue].text = b.analogue1;
-    Text3[PanelAnalogue + 1].text = b.analogue2;
-    Text3[PanelAnalogue + 2].text = b.analogue3;
-    for (int i = 0; i < presss_layout::BlockInputs; ++i)
-        Text3[panelInput(i)].text = onOff(b.inputs[i]);
-    for (int j = 1; j < presss_layout::BlockFurtherInputs; ++j)
-        Text3[panelFurtherInput(j)].text = yesNo(b.furtherInputs[j]);
-    Text3[PanelKind].text = b.kind == 1 ? QStringLiteral("Recip") : QStringLiteral("Screw");
-}
-
-void frmstatusp_engine::show_alarm_words()
-{
-    if (CsAlarms == CsAlarmsInitial)
-        return;
-    const TorvanelBlock b = decodeTorvanelBlock(CsData, selected);
-    Alm.text = torvanelAlarmWords(CsAlarms, selected, b.known ? b.kind : 0);
-    if (Text3[PanelAlarm].text == QLatin1String("YES") && Alm.text == NoAlarms)
-        Alm.text = QStringLiteral("Unknown Alarm's");
-}
-
-void frmstatusp_engine::CompSelect_Click(int index)
-{
-    if (index < 0 || index >= Compressors)
-        return;
-    for (ControlState& b : CompSelect)
-        b.backColor = Off;
-    CompSelect[index].backColor = StepOn;
-    selected = index;
-    if (CsData != CsDataInitial)
-        show_torvanel_data();
-    if (CsAlarms != CsAlarmsInitial)
-        show_alarm_words();
-    Label4.text = QStringLiteral("Torvanel No. %1 Alarms").arg(index + 1);
-    emit changed();
-}
-
-void frmstatusp_engine::dbaseload_Click()
-{
-    if (dbaseload.text == QLatin1String("Torvanel Status")) {
-        dbaseload.text = QStringLiteral("Glacinor Status");
-        dbaseload.toolTip = QStringLiteral("Displays the Glacinor compressor status");
-        Picture1.visible = true;
-        if (CsData != CsDataInitial)
-            show_torvanel_data();
-    } else {
-        dbaseload.text = QStringLiteral("Torvanel Status");
-        dbaseload.toolTip = QStringLiteral("Displays individual compressor status from Torvanels");
-        Picture1.visible = false;
-    }
-    emit changed();
-}
-
-void frmstatusp_engine::Timer3_Timer()
-{
-    ControlState& box = Text3[PanelAlarm];
-    const quint32 before = box.backColor;
-    const quint32 almBefore = Alm.backColor;
-    if (box.text != QLatin1String("YES")) {
-        box.backColor = AlarmPale;
-    } else {
-        box.backColor = box.backColor == Colour::Yellow ? StageOn : Colour::Yellow;
-    }
-    // The alarm list blinks while it names an alarm.
-    const bool alarms = Alm.text != NoAlarms && CsAlarms != CsAlarmsInitial;
-    m_blinkPhase = alarms && !m_blinkPhase;
-    Alm.backColor = m_blinkPhase ? AlarmBlink : AlarmPale;
-    if (box.backColor != before || Alm.backColor != almBefore)
-        emit changed();
-}
-
-void frmstatusp_engine::printgraph_Click(Printer& Printer)
-{
-    cycle.printHead(Printer, QStringLiteral("Velmark Instruments Glacinor Current Pressure Status"));
-    const int bankColumns[Banks] = {30, 45, 60, 75, 90};
-    QList<QPair<int, QString>> cells;
-    for (int b = 0; b < Banks; ++b)
-        cells.append({bankColumns[b], QStringLiteral("Bank No. %1").arg(b + 1)});
-    Printer.line(QString(), cells);
-    const struct {
-        const char* name;
-        const ControlState* boxes;
-    } bankRows[] = {{"Temperatures", Temp},
-                    {"Suction Pressure", suction},
-                    {"Discharge Pressure", discharge},
-                    {"Liquid Pressure", liquid},
-                    {"Liquid Pump", liquidpump}};
-    for (const auto& row : bankRows) {
-        cells.clear();
-        for (int b = 0; b < Banks; ++b)
-            cells.append({bankColumns[b], row.boxes[b].text});
-        Printer.line(QString::fromLatin1(row.name), cells);
-    }
-    Printer.endLine();
-
-    // A box that is shown prints its state by colour; a hidden one a blank.
-    const auto state = [](const ControlState& c) {
-        if (!c.visible)
-            return QStringLiteral(" ");
-        return c.backColor == Off ? QStringLiteral("OFF") : QStringLiteral("ON");
-    };
-    const int compressorColumns[10] = {20, 35, 50, 65, 80, 95, 110, 125, 140, 155};
-    cells = {{compressorColumns[0], QStringLiteral("Bank No.")}, {compressorColumns[1], QStringLiteral("Equal'z Sol")}};
-    for (int k = 1; k <= Stages; ++k)
-        cells.append({compressorColumns[k + 1], QStringLiteral("Stage %1").arg(k)});
-    Printer.line(QStringLiteral("Compressor No."), cells);
-    for (int i = 0; i < Compressors; ++i) {
-        if (!chanframe[i].visible)
-            continue;
-        cells = {{compressorColumns[0], bank[i].text}, {compressorColumns[1], state(equal[i])}};
-        for (int k = 1; k <= Stages; ++k)
-            cells.append({compressorColumns[k + 1], state(stage(k, i))});
-        Printer.line(QString::number(i + 1), cells);
-    }
-    Printer.endLine();
-
-    const int condenserColumns[CondenserStages + 1] = {20, 35, 50, 65, 80};
-    cells = {{condenserColumns[0], QStringLiteral("Bank No.")}};
-    for (int k = 1; k <= CondenserStages; ++k)
-        cells.append({condenserColumns[k], QStringLiteral("Stage %1").arg(k)});
-    Printer.line(QStringLiteral("Condenser No."), cells);
-    for (int c = 0; c < Condensers; ++c) {
-        if (!chanframec[c].visible)
-            continue;
-        cells = {{condenserColumns[0], bankc[c].text}};
-        for (int k = 1; k <= CondenserStages; ++k)
-            cells.append({condenserColumns[k], state(stagec(k, c))});
-        Printer.line(QString::number(c + 1), cells);
-    }
-    Printer.endDoc();
 }

@@ -93,13 +93,8 @@ public:
     // --- procedures ---
     void statusp_do(const QString& reply);
     void statuspa_do(const QString& reply);
-    void chanBanks();
-    void stages();
     void CompSelect_Click(int index);
     void dbaseload_Click();
-    void send_torvanel_request();
-    void show_torvanel_data();
-    void show_alarm_words();
     // The report of the banks and of the compressors and condensers shown.
     void printgraph_Click(Printer& Printer);
 
@@ -107,6 +102,11 @@ signals:
     void changed();
 
 private:
+    void chanBanks();
+    void stages();
+    void send_torvanel_request();
+    void show_torvanel_data();
+    void show_alarm_words();
     void Timer3_Timer();
     void afterFlash();
     void labelPanel(int kind);

@@ -47,7 +47,7 @@ QLabel* head(const QString& text, QWidget* parent)
 
 } // namespace
 
-frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : StatusViewBase(parent), m_e(e)
+frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : StatusViewBase(e.cycle, parent), m_e(e)
 {
     setObjectName(QStringLiteral("frmstatusp"));
     setWindowTitle(QStringLiteral("Current Status Pressure"));
@@ -95,7 +95,7 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     v->addWidget(ceased2);
     bind(c.Text10[0], id);
     bind(c.Text10[2], time);
-    bindInterval(c, interval);
+    bindInterval(interval);
     bind(c.nowstatus, now);
     bind(c.startstatus, start);
     bind(c.stopstatus, stop);
@@ -274,16 +274,6 @@ frmstatusp_view::frmstatusp_view(frmstatusp_engine& e, QWidget* parent) : Status
     connect(panel, &QPushButton::clicked, &e, &frmstatusp_engine::dbaseload_Click);
     connect(&e, &frmstatusp_engine::changed, this, &frmstatusp_view::scheduleRefresh);
     refresh();
-}
-
-bool frmstatusp_view::stale() const
-{
-    return m_e.cycle.stale();
-}
-
-QString frmstatusp_view::ageText() const
-{
-    return m_e.cycle.ageText();
 }
 
 void frmstatusp_view::afterRefresh()

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "status/frmstatus_view.h"
+#include "status/status_view_base.h"
 
 class frmstatusp_engine;
 
@@ -12,8 +12,6 @@ public:
     explicit frmstatusp_view(frmstatusp_engine& engine, QWidget* parent = nullptr);
 
 protected:
-    bool stale() const override;
-    QString ageText() const override;
     void afterRefresh() override;
 
 private:

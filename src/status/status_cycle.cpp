@@ -23,18 +23,23 @@ const char* const kTemperatureActive = "Current Temperature Status is active,";
 // The exclusion lists are not symmetrical on purpose: nobody checks
 // frmmultiprobes or frmstatuspg, so those two may poll beside a third view.
 const StatusCycleParams kTable[] = {
-    {K::status, "F", 4000, kInfoTemperatureIntervalRow, true, true, false, false, false,
-     {{K::statusp, kPressureActive}, {K::statusg, kTempGraphicActive}}},
-    {K::statusg, "F", 4000, kInfoTemperatureIntervalRow, true, true, false, false, false,
-     {{K::statusp, kPressureActive}, {K::status, kTemperatureActive}}},
-    {K::multiprobes, "F", 5000, kInfoTemperatureIntervalRow, true, true, false, false, false,
-     {{K::statusp, kPressureActive}, {K::statusg, kTempGraphicActive}}},
-    {K::statusp, "T", 3000, kInfoPressureIntervalRow, false, false, true, false, true,
-     {{K::status, kTemperatureActive}, {K::statusg, kTempGraphicActive}}},
-    {K::statuspg, "T", 4000, kInfoPressureIntervalRow, false, true, false, true, false,
-     {{K::statusp, kPressureActive},
-      {K::status, kTemperatureActive},
-      {K::statusg, "Current Temperature Status Graphic is active,"}}},
+    {.view = K::status, .letter = "F", .noReplyWait = 4000, .infoRow = kInfoTemperatureIntervalRow,
+     .retryTimer = true, .nowHidesText1 = true,
+     .exclusions = {{K::statusp, kPressureActive}, {K::statusg, kTempGraphicActive}}},
+    {.view = K::statusg, .letter = "F", .noReplyWait = 4000, .infoRow = kInfoTemperatureIntervalRow,
+     .retryTimer = true, .nowHidesText1 = true,
+     .exclusions = {{K::statusp, kPressureActive}, {K::status, kTemperatureActive}}},
+    {.view = K::multiprobes, .letter = "F", .noReplyWait = 5000, .infoRow = kInfoTemperatureIntervalRow,
+     .retryTimer = true, .nowHidesText1 = true,
+     .exclusions = {{K::statusp, kPressureActive}, {K::statusg, kTempGraphicActive}}},
+    {.view = K::statusp, .letter = "T", .noReplyWait = 3000, .infoRow = kInfoPressureIntervalRow,
+     .stopKeepsWatchdog = true, .hasText2 = true,
+     .exclusions = {{K::status, kTemperatureActive}, {K::statusg, kTempGraphicActive}}},
+    {.view = K::statuspg, .letter = "T", .noReplyWait = 4000, .infoRow = kInfoPressureIntervalRow,
+     .nowHidesText1 = true, .noReplyHandlerEmpty = true,
+     .exclusions = {{K::statusp, kPressureActive},
+                    {K::status, kTemperatureActive},
+                    {K::statusg, "Current Temperature Status Graphic is active,"}}},
 };
 
 } // namespace
@@ -64,20 +69,6 @@ StatusCycleView* openStatusView(OpenViews& v, StatusViewKind kind)
     }
     return nullptr;
 }
-
-// One procedure of the cycle: changed() once, when the outermost one ends.
-class StatusCycle::Procedure {
-public:
-    explicit Procedure(StatusCycle& c) : m_c(c) { ++m_c.m_depth; }
-    ~Procedure()
-    {
-        if (--m_c.m_depth == 0)
-            emit m_c.changed();
-    }
-
-private:
-    StatusCycle& m_c;
-};
 
 StatusCycle::StatusCycle(StatusViewKind view, Link& link, Clock& clock, Operator& op, OpenViews& views,
                          QObject* parent)
@@ -133,6 +124,7 @@ bool StatusCycle::excluded()
         StatusCycleView* other = openStatusView(m_views, e.view);
         if (other && other->stopstatusEnabled()) {
             other->stopstatus_Click();
+            notify.flush();
             m_op.message(QStringLiteral("Current Status Active"),
                          {QString::fromLatin1(e.firstLine),
                           QStringLiteral("It will be stopped to allow other proceedures.")});
@@ -160,7 +152,7 @@ void StatusCycle::send_status_request()
 
 void StatusCycle::nowstatus_Click()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     if (excluded())
         return;
     if (m_params.nowHidesText1)
@@ -173,7 +165,7 @@ void StatusCycle::nowstatus_Click()
 
 void StatusCycle::startstatus_Click()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     if (excluded())
         return;
     Timer1.setEnabled(false);
@@ -194,7 +186,7 @@ void StatusCycle::startstatus_Click()
 
 void StatusCycle::stopstatus_Click()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     if (excluded())
         return;
     if (m_params.stopKeepsWatchdog) {
@@ -213,7 +205,7 @@ void StatusCycle::stopstatus_Click()
 
 void StatusCycle::Timer1_Timer()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     restart(Timer1, intervalSeconds() * 1000);
     send_status_request();
     nowstatus.enabled = false;
@@ -223,7 +215,7 @@ void StatusCycle::Timer1_Timer()
 
 void StatusCycle::Timer6_Timer()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     if (!m_params.retryTimer)
         return;
     // No count: it asks until a reply comes or the watchdog ends the cycle.
@@ -237,9 +229,9 @@ void StatusCycle::noReply_Timer()
 {
     if (m_params.noReplyHandlerEmpty)
         return;
-    Procedure p(*this);
+    const auto p = notify.procedure();
     noReply.setEnabled(false);
-    emit changed();
+    notify.flush();
     m_op.message(QStringLiteral("No Response"),
                  {QStringLiteral("The Glacinor failed to respond,"), QStringLiteral("Re do the last command.")});
     nowstatus.enabled = true;
@@ -248,7 +240,7 @@ void StatusCycle::noReply_Timer()
 
 void StatusCycle::Timer4_Timer()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     Timer4.setEnabled(false);
     if (beforeCeased)
         beforeCeased();
@@ -258,7 +250,7 @@ void StatusCycle::Timer4_Timer()
 
 void StatusCycle::Timer5_Timer()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     Timer5.setEnabled(false);
     Text10[2].backColor = DateTimeColour;
     if (afterFlash)
@@ -267,7 +259,7 @@ void StatusCycle::Timer5_Timer()
 
 void StatusCycle::Timer20_Timer()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     Timer20.setEnabled(false);
     firstRequestNow();
 }
@@ -283,7 +275,7 @@ void StatusCycle::firstRequestNow()
 
 void StatusCycle::loadInterval(InstrumentStore* store)
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     m_store = store;
     loading = true;
     int seconds = IntervalMin;
@@ -303,7 +295,7 @@ void StatusCycle::loadInterval(InstrumentStore* store)
 
 void StatusCycle::firstRequest()
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     const LinkGlobals& g = m_link.globals();
     startstatus.enabled = g.link_up;
     nowstatus.enabled = g.link_up;
@@ -321,7 +313,7 @@ void StatusCycle::firstRequest()
 
 void StatusCycle::UpDown1_Change(int value)
 {
-    Procedure p(*this);
+    const auto p = notify.procedure();
     UpDown1.value = value;
     Text10[1].text = QString::number(value);
     if (!loading && m_store)
@@ -385,6 +377,7 @@ QString StatusCycle::ageText() const
     return QStringLiteral("Not current: the last reply came %1 ago").arg(age);
 }
 
+// Tells only when what the views show of the age has changed.
 void StatusCycle::staleTick()
 {
     const bool now = stale();
@@ -393,9 +386,9 @@ void StatusCycle::staleTick()
     const QString age = now ? ageText() : QString();
     if (now == m_wasStale && age == m_lastAge)
         return;
+    const auto p = notify.procedure();
     m_wasStale = now;
     m_lastAge = age;
-    emit changed();
 }
 
 void StatusCycle::printHead(Printer& printer, const QString& title) const

@@ -6,6 +6,7 @@
 // differs from view to view is one row of StatusCycleParams; the views'
 // engines own one StatusCycle each and call it from their parsers.
 
+#include "platform/change_notifier.h"
 #include "platform/clock.h"
 #include "platform/control_state.h"
 
@@ -30,14 +31,14 @@ struct StatusCycleParams {
         const char* firstLine;
     };
     StatusViewKind view;
-    const char* letter;         // the request letter, sent with EOT
-    int noReplyWait;            // ms, multiplied by speed_factor
-    int infoRow;                // row of `info` whose field 7 keeps the interval
-    bool retryTimer;            // Timer6 repeats an unanswered automatic request
-    bool nowHidesText1;         // frmstatusp leaves Text1 as it was
-    bool stopKeepsWatchdog;     // frmstatusp: Stop leaves Timer4 and Text1
-    bool noReplyHandlerEmpty;   // frmstatuspg: its no-reply event does nothing
-    bool hasText2;              // frmstatusp shows Text2 with Text1
+    const char* letter;               // the request letter, sent with EOT
+    int noReplyWait;                  // ms, multiplied by speed_factor
+    int infoRow;                      // row of `info` whose field 7 keeps the interval
+    bool retryTimer = false;          // Timer6 repeats an unanswered automatic request
+    bool nowHidesText1 = false;       // Now hides Text1 (frmstatusp leaves it as it was)
+    bool stopKeepsWatchdog = false;   // frmstatusp: Stop leaves Timer4 and Text1
+    bool noReplyHandlerEmpty = false; // frmstatuspg: its no-reply event does nothing
+    bool hasText2 = false;            // frmstatusp shows Text2 with Text1
     QList<Exclusion> exclusions; // checked in this order by every button
 
     static const StatusCycleParams& of(StatusViewKind view);
@@ -64,6 +65,10 @@ public:
                 QObject* parent = nullptr);
 
     const StatusCycleParams& params() const { return m_params; }
+
+    // The form's procedures and the cycle's share one notifier, so that a
+    // click that runs both tells the views once.
+    ChangeNotifier notify{[this] { emit changed(); }};
 
     // --- controls ---
     ControlState nowstatus, startstatus, stopstatus;
@@ -124,7 +129,6 @@ public:
     bool stale() const;
     // "Last reply 2 min 5 s ago" (empty before any reply).
     QString ageText() const;
-    qint64 lastReplyMs() const { return m_lastReply; }
 
     // Called at the end of Timer5's event (frmstatusp sends "t" from it).
     std::function<void()> afterFlash;
@@ -136,9 +140,6 @@ signals:
     void changed();
 
 private:
-    class Procedure;
-    friend class Procedure;
-
     bool excluded();
     void setCeased(bool shown);
     void firstRequestNow();
@@ -161,6 +162,5 @@ private:
     qint64 m_lastReply = -1;
     bool m_wasStale = false;
     QString m_lastAge;
-    int m_depth = 0;
     bool m_checking = false;
 };

@@ -35,9 +35,9 @@ void TestHelp::everyTopicTheProgramOpensHasAPage_data()
 void TestHelp::everyTopicTheProgramOpensHasAPage()
 {
     QFETCH(QString, topic);
-    const QString page = HelpWindow::pageForTopic(topic);
+    const QString page = HelpView::pageForTopic(topic);
     QVERIFY2(!page.isEmpty(), qPrintable(topic));
-    HelpWindow w;
+    HelpView w;
     w.show_help("q-19.hlp", topic);
     QCOMPARE(w.browser()->source().fileName(), page);
     QVERIFY(w.findChildren<QLabel*>().first()->isHidden());
@@ -45,10 +45,10 @@ void TestHelp::everyTopicTheProgramOpensHasAPage()
 
 void TestHelp::everyListedPageExistsAndSaysSomething()
 {
-    const QStringList topics = HelpWindow::topics();
+    const QStringList topics = HelpView::topics();
     QVERIFY(topics.size() >= 31);
     for (const QString& t : topics) {
-        QFile f(":/help/" + HelpWindow::pageForTopic(t));
+        QFile f(":/help/" + HelpView::pageForTopic(t));
         QVERIFY2(f.open(QIODevice::ReadOnly), qPrintable(t));
         QTextDocument doc;
         doc.setHtml(QString::fromUtf8(f.readAll()));
@@ -58,7 +58,7 @@ void TestHelp::everyListedPageExistsAndSaysSomething()
 
 void TestHelp::unknownTopicOpensTheContentsAndSaysSo()
 {
-    HelpWindow w;
+    HelpView w;
     w.show_help("q-19.chm", "No Such Topic");
     QCOMPARE(w.browser()->source().fileName(), QString("index.html"));
     QLabel* notice = w.findChildren<QLabel*>().first();

@@ -28,7 +28,7 @@ void TestMainWindow::menusAndToolbarFollowTheEngine()
 {
     OpenViews views;
     LinkGlobals g;
-    MDIForm1 w(views, g);
+    MDIForm1_view w(views, g);
     w.engine().MDIForm_Load();
     w.show();
     auto* toolbar = w.findChild<QToolBar*>("Toolbar1");
@@ -53,7 +53,7 @@ void TestMainWindow::aRegisteredViewOpensMaximisedAndClosesBack()
 {
     OpenViews views;
     LinkGlobals g;
-    MDIForm1 w(views, g);
+    MDIForm1_view w(views, g);
     auto* cc = new QLabel("connection");
     cc->setObjectName("ccForm1");
     w.registerView(ViewId::alarm, [](OpenViews&) {
@@ -80,9 +80,9 @@ void TestMainWindow::aRegisteredViewOpensMaximisedAndClosesBack()
 
 void TestMainWindow::aboutShowsVersionAndSystem()
 {
-    frmAbout about;
+    frmAbout_view about;
     QVERIFY(about.lblVersion->text().startsWith("Version "));
-    const QString info = frmAbout::systemInformation();
+    const QString info = frmAbout_view::systemInformation();
     QVERIFY(info.contains("Qt: 6."));
     QVERIFY(info.contains(QRegularExpression("SQLite: 3\\.\\d+")));
 }
@@ -103,7 +103,7 @@ void TestMainWindow::f1OpensThePageOfTheViewInFront()
     QFETCH(QString, page);
     OpenViews views;
     LinkGlobals g;
-    MDIForm1 w(views, g);
+    MDIForm1_view w(views, g);
     for (ViewId id : {ViewId::status, ViewId::statusp, ViewId::alarm})
         w.registerView(id, [](OpenViews&) { return new QLabel("a view"); });
     w.engine().MDIForm_Load();
@@ -120,7 +120,7 @@ void TestMainWindow::whatsThisShowsTheClickedControlsHelp()
 {
     OpenViews views;
     LinkGlobals g;
-    MDIForm1 w(views, g);
+    MDIForm1_view w(views, g);
     QPushButton* now = nullptr;
     QLabel* plain = nullptr;
     w.registerView(ViewId::status, [&](OpenViews&) {

@@ -5,9 +5,16 @@
 
 #include "link/link.h"
 #include "link/link_globals.h"
+#include "link/open_views.h"
 #include "platform/clock.h"
+#include "platform/manual_clock.h"
+#include "platform/operator.h"
+#include "setpoints/instrument_schema.h"
+#include "setpoints/instrument_store.h"
 
 #include <QList>
+#include <QTemporaryDir>
+#include <memory>
 
 class TestLink : public Link {
 public:
@@ -59,4 +66,26 @@ struct ReplyText {
     }
     QString str() const { return text + token; }
     QString token;
+};
+
+// An instrument's store made from the template, and what a status engine needs.
+struct StatusRig {
+    QTemporaryDir dir;
+    QString path = dir.filePath(QStringLiteral("t-7.db"));
+    ManualClock clock{QDateTime(QDate(2026, 3, 9), QTime(14, 5, 30))};
+    TestLink link{clock};
+    ScriptedOperator op;
+    OpenViews views;
+    std::unique_ptr<InstrumentStore> store;
+    StatusRig()
+    {
+        createInstrumentTemplate(path);
+        store = InstrumentStore::open(path);
+    }
+    // The channels of the display rows, in order.
+    void select(const QList<int>& channels)
+    {
+        for (int i = 0; i < 20; ++i)
+            store->setInfo(i, 7, i < channels.size() ? channels[i] : 0);
+    }
 };

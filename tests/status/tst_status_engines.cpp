@@ -1,47 +1,18 @@
-#include "link/open_views.h"
-#include "platform/manual_clock.h"
-#include "platform/operator.h"
-#include "setpoints/instrument_schema.h"
-#include "setpoints/instrument_store.h"
 #include "status/frmstatus_engine.h"
 #include "status/frmstatusp_engine.h"
 #include "status_test_support.h"
 
-#include <QTemporaryDir>
+#include <QSignalSpy>
 #include <QTest>
 
-namespace {
-
-struct Rig {
-    QTemporaryDir dir;
-    QString path = dir.filePath(QStringLiteral("t-7.db"));
-    ManualClock clock;
-    TestLink link{clock};
-    ScriptedOperator op;
-    OpenViews views;
-    std::unique_ptr<InstrumentStore> store;
-    Rig()
-    {
-        createInstrumentTemplate(path);
-        store = InstrumentStore::open(path);
-    }
-    void select(const QList<int>& channels)
-    {
-        for (int i = 0; i < 20; ++i)
-            store->setInfo(i, 7, i < channels.size() ? channels[i] : 0);
-    }
-};
-
-} // namespace
+using Rig = StatusRig;
 
 class tst_status_engines : public QObject {
     Q_OBJECT
 private slots:
     void statusRows();
-    void suctionAndPressureBoxesByVersion_data();
-    void suctionAndPressureBoxesByVersion();
-    void pidByControlKind_data();
-    void pidByControlKind();
+    void boxesByVersionAndKind_data();
+    void boxesByVersionAndKind();
     void twentyFirstSelectionRefused();
     void alarmBlinks();
     void compressorRecordsByNumber();
@@ -50,7 +21,10 @@ private slots:
     void torvanelRequestFromVersion8();
     void torvanelAlarmWords();
     void dbaseFailure();
+    void viewsToldOncePerProcedureAndBeforeEachBox_data();
+    void viewsToldOncePerProcedureAndBeforeEachBox();
     void banksFollowANewCountOfChannels();
+    void valueShowsItsChannelsCard();
 };
 
 void tst_status_engines::statusRows()
@@ -86,40 +60,22 @@ void tst_status_engines::statusRows()
     QCOMPARE(e.cycle.Text10[2].backColor, StatusCycle::FlashColour);
 }
 
-void tst_status_engines::suctionAndPressureBoxesByVersion_data()
-{
-    QTest::addColumn<QString>("version");
-    QTest::addColumn<QString>("suc");
-    QTest::addColumn<QString>("tempP");
-    QTest::newRow("7") << "7" << "N/A" << "N/A";
-    QTest::newRow("8") << "8" << "-1002" << "N/A";
-    QTest::newRow("8.8") << "8.8" << "-1002" << "N-C";
-}
-
-void tst_status_engines::suctionAndPressureBoxesByVersion()
-{
-    QFETCH(QString, version);
-    Rig r;
-    r.link.g.instrument_version = version;
-    frmstatus_engine e(r.link, r.clock, r.op, r.views);
-    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
-    e.status_do(ReplyText(2600, "status").num(1820, -1002).num(1385, -1000).str());
-    QTEST(e.suc[0].text, "suc");
-    QTEST(e.TempP[0].text, "tempP");
-}
-
-void tst_status_engines::pidByControlKind_data()
+void tst_status_engines::boxesByVersionAndKind_data()
 {
     QTest::addColumn<QString>("version");
     QTest::addColumn<int>("kind");
+    QTest::addColumn<QString>("suc");
+    QTest::addColumn<QString>("tempP");
     QTest::addColumn<QString>("pid");
     QTest::addColumn<QString>("fan");
-    QTest::newRow("kind 4 below 14") << "13" << 4 << "PID" << "Fan";
-    QTest::newRow("kind 4") << "14" << 4 << "PID 45 %" << "Fan";
-    QTest::newRow("kind 5") << "14" << 5 << "PID 60 %" << "Fan 70 %";
+    QTest::newRow("7") << "7" << 4 << "N/A" << "N/A" << "PID" << "Fan";
+    QTest::newRow("8") << "8" << 4 << "-1002" << "N/A" << "PID" << "Fan";
+    QTest::newRow("8.8") << "8.8" << 4 << "-1002" << "N-C" << "PID" << "Fan";
+    QTest::newRow("14, kind 4") << "14" << 4 << "-1002" << "N-C" << "PID 45 %" << "Fan";
+    QTest::newRow("14, kind 5") << "14" << 5 << "-1002" << "N-C" << "PID 60 %" << "Fan 70 %";
 }
 
-void tst_status_engines::pidByControlKind()
+void tst_status_engines::boxesByVersionAndKind()
 {
     QFETCH(QString, version);
     QFETCH(int, kind);
@@ -129,7 +85,11 @@ void tst_status_engines::pidByControlKind()
     r.store->setSetpoint(2, 209, kind);
     frmstatus_engine e(r.link, r.clock, r.op, r.views);
     QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
-    e.status_do(ReplyText(2700, "status").num(6 * 3 + 1910, 45).num(6 * 3 + 2306, 60).num(6 * 3 + 2498, 70).str());
+    ReplyText t(2700, "status");
+    t.num(1820, -1002).num(1385, -1000).num(6 * 3 + 1910, 45).num(6 * 3 + 2306, 60).num(6 * 3 + 2498, 70);
+    e.status_do(t.str());
+    QTEST(e.suc[0].text, "suc");
+    QTEST(e.TempP[0].text, "tempP");
     QTEST(e.pid[0].text, "pid");
     QTEST(e.fans[0].text, "fan");
 }
@@ -291,6 +251,40 @@ void tst_status_engines::dbaseFailure()
     QVERIFY(r.link.writes.isEmpty());
 }
 
+void tst_status_engines::viewsToldOncePerProcedureAndBeforeEachBox_data()
+{
+    QTest::addColumn<int>("action");
+    QTest::addColumn<int>("toldBeforeBox"); // -1: no box
+    QTest::addColumn<int>("told");
+    QTest::newRow("load: the cycle's procedures inside tell nothing") << 0 << -1 << 1;
+    QTest::newRow("a 21st channel: the box stands over the rows as they are") << 1 << 1 << 2;
+    QTest::newRow("no reply: the box stands over the buttons as they are") << 2 << 1 << 2;
+    QTest::newRow("a click that returns early") << 3 << -1 << 1;
+}
+
+void tst_status_engines::viewsToldOncePerProcedureAndBeforeEachBox()
+{
+    QFETCH(int, action);
+    Rig r;
+    r.select({1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16, 17, 18, 19, 20});
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QSignalSpy told(&e, &frmstatus_engine::changed);
+    int toldBeforeBox = -1;
+    r.op.setWhileShowing([&](const Operator::Message&) { toldBeforeBox = int(told.size()); });
+    if (action != 0) {
+        QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+        told.clear();
+    }
+    switch (action) {
+    case 0: QVERIFY(e.Form_Load(QStringLiteral("7"), r.path)); break;
+    case 1: e.Command1_Click(30); break;
+    case 2: r.clock.advance(4000); break;
+    case 3: e.Command1_Click(0); break;
+    }
+    QTEST(toldBeforeBox, "toldBeforeBox");
+    QTEST(int(told.size()), "told");
+}
+
 void tst_status_engines::banksFollowANewCountOfChannels()
 {
     Rig r;
@@ -307,6 +301,25 @@ void tst_status_engines::banksFollowANewCountOfChannels()
     e.redoBanks();
     QCOMPARE(e.bank[0].text, QStringLiteral("Bank 2"));
     QCOMPARE(e.bank[1].text, QStringLiteral("Bank 2"));
+}
+
+void tst_status_engines::valueShowsItsChannelsCard()
+{
+    struct Card : SetPointCardView {
+        void showChannel(int channel) override { shown.append(channel); }
+        QList<int> shown;
+    } card;
+    Rig r;
+    r.select({0, 150, 7});
+    frmstatus_engine e(r.link, r.clock, r.op, r.views);
+    QVERIFY(e.Form_Load(QStringLiteral("7"), r.path));
+    e.Temp_Click(2);
+    QVERIFY(!e.setPointCardAvailable());
+    r.views.setPointCard = &card;
+    e.Temp_Click(0); // an empty row has no card
+    e.Temp_Click(2);
+    e.Temp_Click(1);
+    QCOMPARE(card.shown, (QList<int>{7, 150}));
 }
 
 QTEST_GUILESS_MAIN(tst_status_engines)
