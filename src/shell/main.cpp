@@ -53,7 +53,7 @@ void connectLineToDirectory(ccForm1_engine& line, ccForm1_directory& directory, 
                      [&line](bool adding) { line.setDialAllowed(!adding); });
 }
 
-void registerViews(MDIForm1& mainWindow, ccForm1_engine& line, ccForm1_directory& directory,
+void registerViews(MDIForm1_view& mainWindow, ccForm1_engine& line, ccForm1_directory& directory,
                    const DataFolder& folder, Clock& clock, Operator& op)
 {
     // The views this workstation has. Each window owns its engine; a view
