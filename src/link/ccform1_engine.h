@@ -170,6 +170,7 @@ private:
     bool openPort(QString* error);
     void closePort();
     bool portOpen() const;
+    bool startModemTest();
     bool modemMode() const { return Frame8.enabled; }
     Operator::Answer say(const QString& title, const QStringList& lines,
                          Operator::Icon icon = Operator::Icon::None,

@@ -176,9 +176,10 @@ void ccForm1_engine::cancel_redial_Click()
     Timer8.stop();
 }
 
-void ccForm1_engine::ModemGet_Click()
+// The modem test boxes talk to the modem on the port itself: it is opened
+// for them when it is closed.
+bool ccForm1_engine::startModemTest()
 {
-    const auto p = m_notify.procedure();
     modem_test = true;
     modem_text = modem.text;
     if (!portOpen()) {
@@ -187,10 +188,18 @@ void ccForm1_engine::ModemGet_Click()
             modem_test = false;
             say(QStringLiteral("Invalid Port"), {QStringLiteral("Invalid port number,"),
                                                  QStringLiteral("Choose a different port number,"), error});
-            return;
+            return false;
         }
         m_globals.link_up = true;
     }
+    return true;
+}
+
+void ccForm1_engine::ModemGet_Click()
+{
+    const auto p = m_notify.procedure();
+    if (!startModemTest())
+        return;
     Output(commands::modemAskModulation());
     Timer6.setInterval(3000);
     Timer6.setEnabled(true);
@@ -204,18 +213,8 @@ void ccForm1_engine::ModemTest_Click()
         emptyBuffer();
         modem.text = modem_text;
     }
-    modem_test = true;
-    modem_text = modem.text;
-    if (!portOpen()) {
-        QString error;
-        if (!openPort(&error)) {
-            modem_test = false;
-            say(QStringLiteral("Invalid Port"), {QStringLiteral("Invalid port number,"),
-                                                 QStringLiteral("Choose a different port number,"), error});
-            return;
-        }
-        m_globals.link_up = true;
-    }
+    if (!startModemTest())
+        return;
     Output(commands::modemCommand(modem.text));
     modem.text.clear();
     Timer6.setInterval(3000);

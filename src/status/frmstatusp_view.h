@@ -1,6 +1,6 @@
 #pragma once
 
-#include "status/status_view_base.h"
+#include "status/status_base_view.h"
 
 class frmstatusp_engine;
 

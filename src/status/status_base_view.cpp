@@ -1,4 +1,4 @@
-#include "status/status_view_base.h"
+#include "status/status_base_view.h"
 
 #include "platform/widget_control_state.h"
 #include "status/status_cycle.h"
