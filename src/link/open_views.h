@@ -96,6 +96,18 @@ public:
     virtual void status_do(const QString& datain) = 0;
 };
 
+// The small progress form `upload` that the channel transfers show.
+class UploadProgressView {
+public:
+    virtual ~UploadProgressView() = default;
+    // Loads (if needed) and shows the form with its texts.
+    virtual void Show(const QString& title, const QString& label1, const QString& label2, int progress) = 0;
+    // Shows it again as it stands.
+    virtual void Show() = 0;
+    virtual void setProgress(int value, const QString& label1) = 0;
+    virtual void Unload() = 0;
+};
+
 // The set point card, reached from a channel's value in the status views.
 class SetPointCardView {
 public:

@@ -9,7 +9,6 @@
 #include "setpoints/channel_sources.h"
 #include "setpoints/instrument_schema.h"
 #include "setpoints/instrument_store.h"
-#include "setpoints/upload_progress_engine.h"
 
 using channel_record::RecordValue;
 using channel_record::ValueKind;
@@ -40,7 +39,7 @@ void restart(Timer& t, int ms)
 } // namespace
 
 channels_transfer_engine::channels_transfer_engine(Link& link, Clock& clock, Operator& op, OpenViews& views,
-                                                   InstrumentStore& store, upload_progress_engine& upload,
+                                                   InstrumentStore& store, UploadProgressView& upload,
                                                    QObject* parent)
     : QObject(parent), writer(commands::Sender::Channels, link, clock, op, views, store),
       command_prefix(commands::prefix(commands::Sender::Channels)), Timer5(clock), Timer6(clock),
@@ -322,7 +321,8 @@ void channels_transfer_engine::sin_chan_up_load()
             Timer6.start(g.speed_factor * 3000);
             upload_retries = 0;
             const bool sent = send("c");
-            m_upload.Show(m_upload.Caption.text, uploadedLabel(channel + 1), m_upload.Label2.text, channel);
+            m_upload.setProgress(channel, uploadedLabel(channel + 1));
+            m_upload.Show();
             sp.setAbsolutePosition(saved_position);
             emit changed();
             if (!sent)

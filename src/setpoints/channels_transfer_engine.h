@@ -19,13 +19,13 @@ class Link;
 class InstrumentStore;
 class AuditTrail;
 class ChannelSources;
-class upload_progress_engine;
+class UploadProgressView;
 
 class channels_transfer_engine : public QObject, public ChannelsView {
     Q_OBJECT
 public:
     channels_transfer_engine(Link& link, Clock& clock, Operator& op, OpenViews& views,
-                             InstrumentStore& store, upload_progress_engine& upload,
+                             InstrumentStore& store, UploadProgressView& upload,
                              QObject* parent = nullptr);
     ~channels_transfer_engine() override;
 
@@ -123,7 +123,7 @@ private:
     Clock& m_clock;
     Operator& m_op;
     InstrumentStore& m_store;
-    upload_progress_engine& m_upload;
+    UploadProgressView& m_upload;
     AuditTrail* m_audit = nullptr;
     std::unique_ptr<ChannelSources> m_sources;
     int m_auditEntry = -1;

@@ -11,6 +11,12 @@ void upload_progress_engine::Show(const QString& title, const QString& label1, c
     ProgressBar1.value = qBound(0, progress, ProgressBar1_Max);
 }
 
+void upload_progress_engine::Show()
+{
+    const auto p = m_notify.procedure();
+    loaded = true;
+}
+
 void upload_progress_engine::setProgress(int value, const QString& label1)
 {
     const auto p = m_notify.procedure();

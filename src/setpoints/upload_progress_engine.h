@@ -3,12 +3,13 @@
 // The small progress form `upload` of the channel transfers: a title, two
 // lines of text and a bar over the 216 channels.
 
+#include "link/open_views.h"
 #include "platform/change_notifier.h"
 #include "platform/control_state.h"
 
 #include <QObject>
 
-class upload_progress_engine : public QObject {
+class upload_progress_engine : public QObject, public UploadProgressView {
     Q_OBJECT
 public:
     using QObject::QObject;
@@ -21,10 +22,11 @@ public:
     ControlState ProgressBar1; // value: channels done
     bool loaded = false;
 
-    // Loads (if needed) and shows the form with its texts.
-    void Show(const QString& title, const QString& label1, const QString& label2, int progress);
-    void setProgress(int value, const QString& label1);
-    void Unload();
+    // --- UploadProgressView ---
+    void Show(const QString& title, const QString& label1, const QString& label2, int progress) override;
+    void Show() override;
+    void setProgress(int value, const QString& label1) override;
+    void Unload() override;
 
 signals:
     void changed();
