@@ -6,6 +6,7 @@
 #include "directory/data_folder.h"
 #include "directory/directory_engine.h"
 #include "platform/operator.h"
+#include "platform/store_layout.h"
 
 #include <QJsonArray>
 #include <QJsonDocument>
@@ -31,9 +32,6 @@ void out(const QString& text)
 int list(ccForm1_directory& form, bool json)
 {
     form.Option1_Click(0);
-    const QStringList fields = {QStringLiteral("ID"),        QStringLiteral("Name"),
-                                QStringLiteral("Address"),   QStringLiteral("townstate"),
-                                QStringLiteral("phoneno"),   QStringLiteral("glacinorphone")};
     QJsonArray rows;
     for (const QStringList& row : form.rows()) {
         if (!json) {
@@ -41,8 +39,8 @@ int list(ccForm1_directory& form, bool json)
             continue;
         }
         QJsonObject o;
-        for (int f = 0; f < fields.size(); ++f)
-            o.insert(fields.at(f), row.at(f));
+        for (int f = 0; f < directory_table::FieldCount && f < row.size(); ++f)
+            o.insert(directory_table::columnName(directory_table::Field(f)), row.at(f));
         rows.append(o);
     }
     if (json)

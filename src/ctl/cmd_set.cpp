@@ -40,13 +40,8 @@ void out(const QString& text)
 QString directoryId(const CtlOptions& o, QString* why)
 {
     DataFolder(o.dataDir).ensure();
-    std::unique_ptr<Store> dir = Store::open(o.dataDir + QStringLiteral("/q-19.db"));
-    std::unique_ptr<Recordset> rows = dir ? dir->openRecordset(QStringLiteral("Table1")) : nullptr;
-    for (bool more = rows && rows->MoveFirst(); more && !rows->atEOF(); more = rows->MoveNext()) {
-        const QString rowId = rows->value(QStringLiteral("ID")).toString().trimmed();
-        if (o.id.isEmpty() || rowId == o.id)
-            return rowId;
-    }
+    if (const std::optional<ctl::DirectoryRow> row = ctl::directoryRow(o.dataDir, o.id))
+        return row->id;
     *why = o.id.isEmpty() ? QStringLiteral("the directory holds no instrument: give --id ID")
                           : QStringLiteral("instrument %1 is not in the directory").arg(o.id);
     return {};

@@ -45,27 +45,14 @@ void out(const QString& text)
 // The directory row of the ID (else the first one) and its modem number.
 QString instrumentId(const CtlOptions& o, QString* phone)
 {
-    QString id = o.id;
     // A new data folder is made as at the program's first start.
     DataFolder(o.dataDir).ensure();
-    const QString directory = o.dataDir + QStringLiteral("/q-19.db");
-    if (!QFileInfo::exists(directory))
-        return id;
-    std::unique_ptr<Store> dir = Store::open(directory);
-    std::unique_ptr<Recordset> rows = dir ? dir->openRecordset(QStringLiteral("Table1")) : nullptr;
-    if (!rows)
-        return id;
-    for (bool more = rows->MoveFirst(); more && !rows->atEOF(); more = rows->MoveNext()) {
-        const QString rowId = rows->value(QStringLiteral("ID")).toString().trimmed();
-        if (id.isEmpty())
-            id = rowId;
-        if (rowId == id) {
-            if (phone)
-                *phone = rows->value(QStringLiteral("glacinorphone")).toString().trimmed();
-            break;
-        }
-    }
-    return id;
+    const std::optional<ctl::DirectoryRow> row = ctl::directoryRow(o.dataDir, o.id);
+    if (!row)
+        return o.id;
+    if (phone)
+        *phone = row->modemPhone;
+    return row->id;
 }
 
 QString storePath(const CtlOptions& o, const QString& id)

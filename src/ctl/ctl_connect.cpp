@@ -4,6 +4,7 @@
 #include "directory/directory_engine.h"
 #include "platform/tcp_line.h"
 #include "platform/line_factory.h"
+#include "platform/store_layout.h"
 
 #include <QEventLoop>
 #include <QFileInfo>
@@ -31,6 +32,20 @@ QString selectedInstrument(const QString& dataDir)
     const QString id = form.openId();
     form.Form_Unload();
     return id;
+}
+
+std::optional<DirectoryRow> directoryRow(const QString& dataDir, const QString& id)
+{
+    using namespace directory_table;
+    const QString file = DataFolder(dataDir).directoryFile();
+    std::unique_ptr<Store> dir = QFileInfo::exists(file) ? Store::open(file) : nullptr;
+    std::unique_ptr<Recordset> rows = dir ? dir->openRecordset(TableName) : nullptr;
+    for (bool more = rows && rows->MoveFirst(); more && !rows->atEOF(); more = rows->MoveNext()) {
+        const QString rowId = rows->value(columnName(ID)).toString().trimmed();
+        if (id.isEmpty() || rowId == id)
+            return DirectoryRow{rowId, rows->value(columnName(glacinorphone)).toString().trimmed()};
+    }
+    return std::nullopt;
 }
 
 Operator::Answer ConnectionOperator::ask(const Message& message)
@@ -64,21 +79,9 @@ int Connection::open(const QString& command)
                      qPrintable(folderError));
         return ctl::Failure;
     }
-    const QString directory = m_options.dataDir + QStringLiteral("/q-19.db");
-    if (QFileInfo::exists(directory)) {
-        if (std::unique_ptr<Store> dir = Store::open(directory)) {
-            if (std::unique_ptr<Recordset> rows = dir->openRecordset(QStringLiteral("Table1"))) {
-                for (bool more = rows->MoveFirst(); more && !rows->atEOF(); more = rows->MoveNext()) {
-                    const QString rowId = rows->value(QStringLiteral("ID")).toString().trimmed();
-                    if (m_id.isEmpty())
-                        m_id = rowId;
-                    if (rowId == m_id) {
-                        m_phone = rows->value(QStringLiteral("glacinorphone")).toString().trimmed();
-                        break;
-                    }
-                }
-            }
-        }
+    if (const std::optional<DirectoryRow> row = directoryRow(m_options.dataDir, m_id)) {
+        m_id = row->id;
+        m_phone = row->modemPhone;
     }
     if (m_id.isEmpty()) {
         std::fprintf(stderr, "q19ctl: no instrument: give --id ID\n");
@@ -93,7 +96,7 @@ int Connection::open(const QString& command)
     if (!file.isEmpty() && QFileInfo::exists(file)) {
         m_store = Store::open(file);
         if (m_store)
-            m_info = m_store->openRecordset(QStringLiteral("info"));
+            m_info = m_store->openRecordset(kInfoTable);
     }
 
     // A data folder made by the workstation's demo names the built-in simulator as its port.

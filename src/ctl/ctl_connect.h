@@ -14,12 +14,22 @@
 
 #include <functional>
 #include <memory>
+#include <optional>
 
 namespace ctl {
 
 // The instrument the workstation selects at start: the directory form's
 // first row by name whose data base is there. Empty when there is none.
 QString selectedInstrument(const QString& dataDir);
+
+// An instrument's row of the directory: the row of the ID, or the first row
+// when the ID is empty. Null when the directory has no such row (or cannot
+// be read).
+struct DirectoryRow {
+    QString id;
+    QString modemPhone;
+};
+std::optional<DirectoryRow> directoryRow(const QString& dataDir, const QString& id);
 
 // Prints the dialogue's messages on stderr, as HeadlessOperator does; a
 // port that would not open names the network address when it is one, as the

@@ -1,12 +1,11 @@
 #include "ctl/ctl_command.h"
 #include "ctl/ctl_connect.h"
+#include "directory/data_folder.h"
 #include "platform/tcp_line.h"
 
 #include <QCommandLineParser>
 #include <QCoreApplication>
-#include <QDir>
 #include <QRegularExpression>
-#include <QStandardPaths>
 #include <cstdio>
 
 namespace {
@@ -212,10 +211,7 @@ int main(int argc, char** argv)
             options.own.insert(name, values.isEmpty() ? QStringList{QString()} : values);
     }
 
-    if (options.dataDir.isEmpty())
-        options.dataDir = QStandardPaths::writableLocation(QStandardPaths::GenericDataLocation)
-            + QStringLiteral("/q19");
-    options.dataDir = QDir(options.dataDir).absolutePath();
+    options.dataDir = DataFolder::location(options.dataDir);
     if (command->needsInstrument && options.id.isEmpty())
         options.id = ctl::selectedInstrument(options.dataDir);
     return command->run(options);

@@ -4,16 +4,23 @@
 
 #include "link/ccform1_texts.h"
 #include "platform/store.h"
+#include "platform/store_layout.h"
 
 using namespace ccform1;
 
 namespace {
 
 const QString kDefaultSettings = QStringLiteral("9600,n,8,1");
-constexpr int kInfoField = 41;
 
-// Rows of the instrument's info table (field 41) that hold the connection.
-enum InfoRow { RowSettings = 2, RowPort = 3, RowType = 4, RowDialTone = 5, RowModem = 6, RowFlow = 7 };
+// Rows of the instrument's `info` table that hold the connection.
+enum InfoRow {
+    RowSettings = kInfoPortSettingsRow,
+    RowPort = kInfoPortRow,
+    RowType = kInfoConnectionTypeRow,
+    RowDialTone = kInfoDialToneRow,
+    RowModem = kInfoModemTextRow,
+    RowFlow = kInfoFlowControlRow,
+};
 
 QString parityName(QChar letter)
 {
@@ -81,13 +88,13 @@ QVariant ccForm1_engine::infoCell(int row) const
 {
     if (!m_info)
         return {};
-    return m_info->cell(row, kInfoField);
+    return m_info->cell(row, kInfoConnectionColumn);
 }
 
 void ccForm1_engine::setInfoCell(int row, const QVariant& value)
 {
     if (m_info)
-        m_info->setCell(row, kInfoField, value);
+        m_info->setCell(row, kInfoConnectionColumn, value);
 }
 
 QString ccForm1_engine::composedSettings() const

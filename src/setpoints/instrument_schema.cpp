@@ -53,6 +53,11 @@ Limits fieldLimits(int field)
     return {0, 1}; // the check boxes' flags
 }
 
+bool within(int ordinal, int first, int count)
+{
+    return ordinal >= first && ordinal < first + count;
+}
+
 QString infoColumnName(int ordinal)
 {
     switch (ordinal) {
@@ -61,28 +66,29 @@ QString infoColumnName(int ordinal)
     case kInfoField: return QStringLiteral("field");
     case kInfoMinimum: return QStringLiteral("minimum");
     case kInfoMaximum: return QStringLiteral("maximum");
-    case 7: return QStringLiteral("view_channel");
-    case 8: return QStringLiteral("graph");
-    case 9: return QStringLiteral("graph_caption");
-    case 11: return QStringLiteral("room_channel");
-    case 34: return QStringLiteral("brumalet_interval");
-    case 39: return QStringLiteral("report_heading");
-    case 40: return QStringLiteral("show_descriptions");
-    case 41: return QStringLiteral("connection");
-    case 42: return QStringLiteral("tab_name");
-    case 50: return QStringLiteral("kind_fore_colour");
-    case 51: return QStringLiteral("kind_back_colour");
+    case kInfoShownChannelColumn: return QStringLiteral("view_channel");
+    case kInfoGraphColumn: return QStringLiteral("graph");
+    case kInfoGraphCaptionColumn: return QStringLiteral("graph_caption");
+    case kInfoRoomChannelColumn: return QStringLiteral("room_channel");
+    case kInfoBrumaletColumn: return QStringLiteral("brumalet_interval");
+    case kInfoHeadingColumn: return QStringLiteral("report_heading");
+    case kInfoDescriptionsColumn: return QStringLiteral("show_descriptions");
+    case kInfoConnectionColumn: return QStringLiteral("connection");
+    case kInfoTabNameColumn: return QStringLiteral("tab_name");
+    case kInfoKindForeColumn: return QStringLiteral("kind_fore_colour");
+    case kInfoKindBackColumn: return QStringLiteral("kind_back_colour");
     default: break;
     }
-    if (ordinal >= 12 && ordinal <= 31)
-        return QStringLiteral("room_probe_%1").arg(ordinal - 11, 2, 10, QLatin1Char('0'));
-    static const char* const pane[] = {"tab", "name", "in_use", "channel", "index", "colour", "room"};
-    if (ordinal >= 43 && ordinal <= 49)
-        return QStringLiteral("pane_") + QLatin1String(pane[ordinal - 43]);
-    if (ordinal >= 53 && ordinal <= 59)
-        return QStringLiteral("plant_pane_") + QLatin1String(pane[ordinal - 53]);
-    if (ordinal >= 62 && ordinal <= 65)
-        return QStringLiteral("plant_tag_%1").arg(ordinal - 54);
+    if (within(ordinal, kInfoFirstProbeColumn, kInfoProbes))
+        return QStringLiteral("room_probe_%1").arg(ordinal - kInfoFirstProbeColumn + 1, 2, 10, QLatin1Char('0'));
+    static const char* const pane[info_pane::Columns] = {"tab",   "name",   "in_use", "channel",
+                                                         "index", "colour", "room"};
+    if (within(ordinal, kInfoPaneFirstColumn, info_pane::Columns))
+        return QStringLiteral("pane_") + QLatin1String(pane[ordinal - kInfoPaneFirstColumn]);
+    if (within(ordinal, kInfoPlantPaneFirstColumn, info_pane::Columns))
+        return QStringLiteral("plant_pane_") + QLatin1String(pane[ordinal - kInfoPlantPaneFirstColumn]);
+    if (within(ordinal, kInfoPlantTagFirstColumn, kInfoPlantTags))
+        return QStringLiteral("plant_tag_%1").arg(ordinal - kInfoPlantTagFirstColumn + kInfoPlantFirstTag);
     return QStringLiteral("spare_%1").arg(ordinal, 2, 10, QLatin1Char('0'));
 }
 
@@ -96,26 +102,26 @@ bool infoColumnIsNumeric(int ordinal)
     case kInfoField:
     case kInfoMinimum:
     case kInfoMaximum:
-    case 7:
-    case 11:
-    case 34:
-    case 40:
-    case 43:
-    case 47:
-    case 48:
-    case 50:
-    case 51:
-    case 53:
-    case 57:
-    case 58:
+    case kInfoShownChannelColumn:
+    case kInfoRoomChannelColumn:
+    case kInfoBrumaletColumn:
+    case kInfoDescriptionsColumn:
+    case kInfoKindForeColumn:
+    case kInfoKindBackColumn:
         return true;
     default:
-        return ordinal >= 12 && ordinal <= 31;
+        break;
     }
+    for (int pane : {kInfoPaneFirstColumn, kInfoPlantPaneFirstColumn})
+        for (int c : {info_pane::Tab, info_pane::Index, info_pane::Colour})
+            if (ordinal == pane + c)
+                return true;
+    return within(ordinal, kInfoFirstProbeColumn, kInfoProbes);
 }
 
 // Colours of the ten indicator kinds (blue, green, red order): fore, back.
-constexpr int kKindBack[10] = {65280, 65535, 255, 16711680, 16776960, 16711935, 33023, 12632256, 8421504, 16777215};
+constexpr int kKindBack[kInfoKinds] = {65280,    65535, 255,      16711680, 16776960,
+                                       16711935, 33023, 12632256, 8421504,  16777215};
 
 bool fail(QString* error, const QString& message)
 {
@@ -233,6 +239,43 @@ QVariant templateSetpoint(int row, int field)
     }
 }
 
+namespace {
+
+// The template's line: 9600 baud, port 1, a direct line without flow control.
+QVariant connectionCell(int row)
+{
+    switch (row) {
+    case kInfoPortSettingsRow: return QStringLiteral("9600,n,8,1");
+    case kInfoPortRow: return 1;
+    case kInfoConnectionTypeRow: return 1;
+    case kInfoDialToneRow: return 0;
+    // Sits between "ATX4" and "DT": verbose result codes, which are the
+    // words the dispatcher looks for.
+    case kInfoModemTextRow: return QStringLiteral("V1");
+    case kInfoFlowControlRow: return 0;
+    default: return {};
+    }
+}
+
+// The graph's settings: legend on, the rest off, no pointer channel.
+QVariant graphSettingCell(int row)
+{
+    switch (row) {
+    case kInfoLegendRow: return 1;
+    case kInfoPointerNameRow: return QStringLiteral("No Channel Selected ");
+    case kInfoDataPointsRow:
+    case kInfoDateMarkerRow:
+    case kInfoValueMarkerRow:
+    case kInfoPointerChannelRow:
+    case kInfoLastMaximumRow:
+    case kInfoLastMinimumRow:
+        return 0;
+    default: return {};
+    }
+}
+
+} // namespace
+
 QVariantList templateInfoRow(int row)
 {
     QVariantList v(kInfoColumns);
@@ -245,61 +288,38 @@ QVariantList templateInfoRow(int row)
         v[kInfoMinimum] = r.minimum;
         v[kInfoMaximum] = r.maximum;
     }
-    if (row < 20) {
-        v[7] = 0;  // status display rows: empty
-        v[8] = 0;  // graph channels: none
-        v[9] = QString();
-        v[11] = 0; // room panels: none
+    if (row < kInfoChosenChannels) {
+        v[kInfoShownChannelColumn] = 0; // status display rows: empty
+        v[kInfoGraphColumn] = 0;        // graph channels: none
+        v[kInfoGraphCaptionColumn] = QString();
+        v[kInfoRoomChannelColumn] = 0;  // room panels: none
+    } else if (const QVariant graph = graphSettingCell(row); graph.isValid()) {
+        v[kInfoGraphColumn] = graph;
     }
-    if (row < 200) {
-        for (int c = 12; c <= 31; ++c)
-            v[c] = 0; // probes of a room: free
-        v[45] = QStringLiteral("0"); // pane rows free
-        v[55] = QStringLiteral("0");
+    if (row < kInfoPaneRows) {
+        for (int c = 0; c < kInfoProbes; ++c)
+            v[kInfoFirstProbeColumn + c] = 0; // probes of a room: free
+        v[kInfoPaneFirstColumn + info_pane::InUse] = QStringLiteral("0");
+        v[kInfoPlantPaneFirstColumn + info_pane::InUse] = QStringLiteral("0");
     }
-    if (row < 10) {
-        v[50] = 0;
-        v[51] = kKindBack[row];
+    if (row < kInfoKinds) {
+        v[kInfoKindForeColumn] = 0;
+        v[kInfoKindBackColumn] = kKindBack[row];
     }
-    if (row < 5)
-        v[42] = QStringLiteral("Not Set");
-    switch (row) {
-    case 0:
-        v[34] = 30; // seconds between Brumalet updates
-        v[39] = QStringLiteral("Company Name");
-        break;
-    case 1: v[39] = QString(); break;
-    case 2:
-        v[39] = QString();
-        v[40] = 1; // status view shows descriptions
-        v[kInfoConnectionColumn] = QStringLiteral("9600,n,8,1");
-        break;
-    case 3: v[kInfoConnectionColumn] = 1; break; // port 1
-    case 4:
-        v[40] = 0; // channel buttons show numbers
-        v[kInfoConnectionColumn] = 1; // direct
-        break;
-    case 5: v[kInfoConnectionColumn] = 0; break;
-    // Sits between "ATX4" and "DT": verbose result codes, which are the
-    // words the dispatcher looks for.
-    case 6: v[kInfoConnectionColumn] = QStringLiteral("V1"); break;
-    case 7: v[kInfoConnectionColumn] = 0; break; // no flow control
-    case kInfoTemperatureIntervalRow:
-    case kInfoPressureIntervalRow:
+    if (row < kInfoTabs)
+        v[kInfoTabNameColumn] = QStringLiteral("Not Set");
+    if (row < kInfoHeadingLines)
+        v[kInfoHeadingColumn] = row == 0 ? QStringLiteral("Company Name") : QString();
+    if (row == kInfoBrumaletRow)
+        v[kInfoBrumaletColumn] = 30; // seconds between updates
+    if (row == kInfoStatusDescriptionsRow)
+        v[kInfoDescriptionsColumn] = 1;
+    if (row == kInfoChannelsDescriptionsRow)
+        v[kInfoDescriptionsColumn] = 0;
+    if (const QVariant line = connectionCell(row); line.isValid())
+        v[kInfoConnectionColumn] = line;
+    if (row == kInfoTemperatureIntervalRow || row == kInfoPressureIntervalRow)
         v[kInfoIntervalColumn] = 10;
-        v[8] = 0; // Data Points off
-        break;
-    case 31: v[8] = 1; break; // legend on
-    case 32:
-    case 33:
-    case 34:
-    case 37:
-    case 38:
-        v[8] = 0;
-        break;
-    case 35: v[8] = QStringLiteral("No Channel Selected "); break;
-    default: break;
-    }
     return v;
 }
 

@@ -5,6 +5,7 @@
 // and the program cannot disagree about a field, a range or a row of `info`.
 
 #include "platform/store.h"
+#include "platform/store_layout.h"
 
 #include <QList>
 #include <QString>
@@ -13,35 +14,11 @@
 constexpr int kInstrumentSchemaVersion = 1;
 
 inline const QString kSetpointsTable = QStringLiteral("setpoints");
-inline const QString kInfoTable = QStringLiteral("info");
 inline const QString kHistoryTable = QStringLiteral("History");
 inline const QString kPowerTable = QStringLiteral("Power");
 inline const QString kAlarmLogTable = QStringLiteral("Alarm Log");
 
-constexpr int kInfoRows = 227;    // every row that a view or the verification reads
-constexpr int kInfoColumns = 66;  // ordinals 0..65
-constexpr int kInfoValidationRows = 227;
 constexpr int kHistoryChannels = 216;
-
-// `info` columns 0..4 of the validation rows.
-constexpr int kInfoName = 0;
-constexpr int kInfoDefault = 1;
-constexpr int kInfoField = 2;
-constexpr int kInfoMinimum = 3;
-constexpr int kInfoMaximum = 4;
-
-// Cells of `info` read at start by the connection form: column 41, one row each.
-constexpr int kInfoConnectionColumn = 41;
-constexpr int kInfoPortSettingsRow = 2;
-constexpr int kInfoPortRow = 3;
-constexpr int kInfoConnectionTypeRow = 4; // 0 modem, 1 direct
-constexpr int kInfoDialToneRow = 5;
-constexpr int kInfoModemTextRow = 6;
-constexpr int kInfoFlowControlRow = 7;
-// Interval of the status cycle in seconds: column 7.
-constexpr int kInfoIntervalColumn = 7;
-constexpr int kInfoTemperatureIntervalRow = 29;
-constexpr int kInfoPressureIntervalRow = 30;
 
 QStringList instrumentTables();
 QList<Store::Column> setpointsColumns();

@@ -3,6 +3,7 @@
 #include "link/link.h"
 #include "link/link_globals.h"
 #include "platform/operator.h"
+#include "platform/store_layout.h"
 #include "setpoints/catalogue.h"
 #include "setpoints/instrument_store.h"
 #include "setpoints/view_store.h"
@@ -12,9 +13,6 @@
 
 namespace {
 
-constexpr int kInfoSelectedColumn = 7;  // rows 0..19: channel of display row i
-constexpr int kInfoDisplayModeRow = 2;
-constexpr int kInfoDisplayModeColumn = 40;
 constexpr int kAssocFirstField = 26;    // 26..28
 constexpr int kControlKindField = 209;
 constexpr int kBankSizeFirstField = 78; // 78..82, row 0
@@ -107,9 +105,9 @@ bool frmstatus_engine::Form_Load(const QString& instrumentId, const QString& sto
         sp.MoveFirst();
 
     clear_pid_fan_labels();
-    const QVariant mode = m_store->info(kInfoDisplayModeRow, kInfoDisplayModeColumn);
+    const QVariant mode = m_store->info(kInfoStatusDescriptionsRow, kInfoDescriptionsColumn);
     if (mode.isNull())
-        m_store->setInfo(kInfoDisplayModeRow, kInfoDisplayModeColumn, 1);
+        m_store->setInfo(kInfoStatusDescriptionsRow, kInfoDescriptionsColumn, 1);
     showDescriptions = mode.isNull() || number(mode) != 0;
     readRows();
     show_channel_rows();
@@ -125,7 +123,7 @@ bool frmstatus_engine::Form_Load(const QString& instrumentId, const QString& sto
 void frmstatus_engine::readRows()
 {
     for (int i = 0; i < Rows; ++i)
-        m_rows[i] = m_store ? number(m_store->info(i, kInfoSelectedColumn)) : 0;
+        m_rows[i] = m_store ? number(m_store->info(i, kInfoShownChannelColumn)) : 0;
 }
 
 QString frmstatus_engine::channelCaption(int n)
@@ -310,7 +308,7 @@ void frmstatus_engine::Command1_Click(int index)
         Command1[index].backColor = Off;
         for (int i = 0; i < Rows; ++i) {
             if (m_rows[i] == index) {
-                m_store->setInfo(i, kInfoSelectedColumn, 0);
+                m_store->setInfo(i, kInfoShownChannelColumn, 0);
                 m_rows[i] = 0;
             }
         }
@@ -329,7 +327,7 @@ void frmstatus_engine::Command1_Click(int index)
             show_channel_rows();
             return;
         }
-        m_store->setInfo(free, kInfoSelectedColumn, index);
+        m_store->setInfo(free, kInfoShownChannelColumn, index);
         m_rows[free] = index;
         Command1[index].backColor = Selected;
     }
@@ -345,7 +343,7 @@ void frmstatus_engine::Command2_Click()
     }
     for (int i = 0; i < Rows; ++i) {
         if (m_store)
-            m_store->setInfo(i, kInfoSelectedColumn, 0);
+            m_store->setInfo(i, kInfoShownChannelColumn, 0);
         m_rows[i] = 0;
     }
     show_channel_rows();
@@ -357,7 +355,7 @@ void frmstatus_engine::Cmdselchan_Click()
     showDescriptions = false;
     Changechannels();
     if (m_store)
-        m_store->setInfo(kInfoDisplayModeRow, kInfoDisplayModeColumn, 0);
+        m_store->setInfo(kInfoStatusDescriptionsRow, kInfoDescriptionsColumn, 0);
 }
 
 void frmstatus_engine::Cmdseldis_Click()
@@ -366,14 +364,14 @@ void frmstatus_engine::Cmdseldis_Click()
     showDescriptions = true;
     Changechannels();
     if (m_store)
-        m_store->setInfo(kInfoDisplayModeRow, kInfoDisplayModeColumn, 1);
+        m_store->setInfo(kInfoStatusDescriptionsRow, kInfoDescriptionsColumn, 1);
 }
 
 void frmstatus_engine::Temp_Click(int index)
 {
     if (index < 0 || index >= Rows || !m_views.setPointCard || !m_store)
         return;
-    const int n = number(m_store->info(index, kInfoSelectedColumn));
+    const int n = number(m_store->info(index, kInfoShownChannelColumn));
     if (n > 0)
         m_views.setPointCard->showChannel(n);
 }

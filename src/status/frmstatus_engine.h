@@ -54,9 +54,10 @@ public:
     ControlState Command2, Cmdselchan, Cmdseldis, printgraph;
     Timer Timer2;                           // alarm blink
 
-    // info row 2, field 40: false shows channel numbers, true descriptions.
+    // Kept in `info` (kInfoDescriptionsColumn): false shows channel numbers,
+    // true descriptions.
     bool showDescriptions = true;
-    // The channel shown in each display row (info rows 0..19, field 7).
+    // The channel shown in each display row (kept in `info`, kInfoShownChannelColumn).
     int rowChannel(int row) const { return m_rows[row]; }
 
     // Whether a click on a value can show the set point card.
