@@ -6,6 +6,7 @@
 #include "ctl/status_report.h"
 #include "directory/data_folder.h"
 #include "link/commands.h"
+#include "setpoints/catalogue.h"
 #include "setpoints/instrument_store.h"
 #include "status/presss_codec.h"
 #include "status/status_codec.h"
@@ -15,9 +16,6 @@
 #include <cstdio>
 
 namespace {
-
-constexpr int kControlKindField = 209;   // of the channel's row
-constexpr int kCondenserKindField = 169; // of the condenser's row
 
 // Takes the reply the dispatcher hands to an open status view.
 class ReplyCatcher : public TemperatureStatusView, public PressureStatusView {
@@ -89,7 +87,7 @@ int status(const CtlOptions& o)
     if (!c.waitFor([&] { return !catcher.status.isEmpty(); }, noReplyWait(c, StatusViewKind::status)))
         return noResponse(c.op);
     StatusReport report{c.id(), c.globals.instrument_version, c.globals.versionNumber(), catcher.status, {}};
-    report.controlKinds = setpointColumn(o, c.id(), kControlKindField, status_layout::Channels);
+    report.controlKinds = setpointColumn(o, c.id(), catalogue::kControlKindField, status_layout::Channels);
     print(o.json ? jsonText(statusJson(report)) : statusTable(report));
     return ctl::Ok;
 }
@@ -122,7 +120,7 @@ int pressure(const CtlOptions& o)
     }
     PressureReport report{c.id(), c.globals.instrument_version, c.globals.versionNumber(), catcher.presss,
                           catcher.torvan, {}};
-    report.condenserKinds = setpointColumn(o, c.id(), kCondenserKindField, presss_layout::Condensers);
+    report.condenserKinds = setpointColumn(o, c.id(), catalogue::kCondenserKindField, presss_layout::Condensers);
     print(o.json ? jsonText(pressureJson(report)) : pressureTable(report));
     return ctl::Ok;
 }

@@ -13,8 +13,8 @@ struct StatusReport {
     QString version;        // the instrument's version text
     double versionNumber = 0; // the same as a number
     QString reply;          // "status"
-    // Control kind (set point field 209) of channel n at index n - 1; a
-    // channel past the end has no kind.
+    // Control kind (catalogue::kControlKindField) of channel n at index
+    // n - 1; a channel past the end has no kind.
     QList<int> controlKinds;
 };
 
@@ -24,8 +24,8 @@ struct PressureReport {
     double versionNumber = 0;
     QString presss;
     QString torvan;          // empty when not asked (below version 8)
-    // Condenser kind (set point field 169) of condenser c at index c; 4 is
-    // the variable condenser.
+    // Condenser kind (catalogue::kCondenserKindField) of condenser c at
+    // index c; 4 is the variable condenser.
     QList<int> condenserKinds;
 };
 

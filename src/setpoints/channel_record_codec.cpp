@@ -9,97 +9,10 @@ namespace channel_record {
 
 namespace {
 
-// Which channels a run of values stands for. Each block stands inside the one
-// before: the first block a channel fails ends its record.
-enum class Block {
-    All,
-    Upto200,
-    Upto100,
-    Upto66,    // fields 223, 224 (firmware 14 and on)
-    Upto32,    // fields 225..227 (firmware 14 and on)
-    Upto27,
-    Upto15,
-    Upto12,
-    Only1,
-    Only1Above85, // firmware above 8.5
-    Only1From87,  // firmware 8.7 and on
-};
+using Block = catalogue::RecordBlock;
 
-constexpr int kCompressorTypeField = 165;
-constexpr int kPidFullOnField = 224;
-
-struct Run {
-    int firstField;
-    int count;
-    int width; // 0: the width of field 165
-    Block block;
-};
-
-// The values of the record in reply order; fields of a run are consecutive.
-constexpr Run kRuns[] = {
-    {1, 1, 1, Block::All},
-    {85, 1, 1, Block::All},
-    {86, 4, 6, Block::All},
-    {catalogue::kDescriptionField, 1, 6, Block::All},
-    {90, 1, 1, Block::All},
-    {91, 4, 6, Block::All},
-    {14, 10, 6, Block::Upto200},
-    {6, 4, 6, Block::Upto200},
-    {54, 7, 6, Block::Upto200},
-    {48, 3, 1, Block::Upto100},
-    {44, 1, 1, Block::Upto100},
-    {43, 1, 1, Block::Upto100},
-    {52, 1, 1, Block::Upto100},
-    {53, 1, 6, Block::Upto100},
-    {2, 4, 6, Block::Upto100},
-    {29, 14, 6, Block::Upto100},
-    {51, 1, 1, Block::Upto100},
-    {209, 1, 1, Block::Upto100},
-    {26, 3, 6, Block::Upto100},
-    {10, 1, 6, Block::Upto100},
-    {11, 1, 1, Block::Upto100},
-    {45, 1, 1, Block::Upto100},
-    {95, 1, 6, Block::Upto100},
-    {46, 1, 1, Block::Upto100},
-    {98, 1, 1, Block::Upto100},
-    {13, 1, 6, Block::Upto100},
-    {210, 1, 6, Block::Upto100},
-    {12, 1, 6, Block::Upto100},
-    {223, 2, 6, Block::Upto66},
-    {225, 3, 6, Block::Upto32},
-    {168, 1, 6, Block::Upto27},
-    {kCompressorTypeField, 1, 0, Block::Upto27},
-    {166, 1, 6, Block::Upto27},
-    {207, 1, 6, Block::Upto27},
-    {167, 1, 6, Block::Upto27},
-    {202, 4, 6, Block::Upto15},
-    {170, 1, 6, Block::Upto12},
-    {206, 1, 6, Block::Upto12},
-    {169, 1, 1, Block::Upto12},
-    {76, 2, 6, Block::Only1},
-    {61, 15, 6, Block::Only1},
-    {78, 5, 6, Block::Only1},
-    {155, 10, 6, Block::Only1},
-    {84, 1, 6, Block::Only1},
-    {110, 20, 4, Block::Only1},
-    {100, 10, 4, Block::Only1},
-    {135, 10, 4, Block::Only1},
-    {181, 10, 4, Block::Only1},
-    {171, 10, 1, Block::Only1},
-    {130, 5, 6, Block::Only1},
-    {83, 1, 1, Block::Only1},
-    {145, 10, 6, Block::Only1},
-    {96, 2, 6, Block::Only1},
-    {208, 1, 6, Block::Only1},
-    {201, 1, 1, Block::Only1},
-    {196, 5, 1, Block::Only1},
-    {191, 5, 6, Block::Only1},
-    {99, 1, 6, Block::Only1},
-    {211, 2, 6, Block::Only1Above85},
-    {213, 10, 1, Block::Only1From87},
-};
-
-bool isPidBlock(Block b) { return b == Block::Upto66 || b == Block::Upto32; }
+// The PID values of firmware 14: no `info` rows, a filler in older records.
+bool isPidBlock(Block b) { return !catalogue::hasInfoRows(b); }
 
 // The upload's test of a block, by the 1-based channel.
 bool uploadStands(Block b, int channel, double version)
@@ -108,8 +21,8 @@ bool uploadStands(Block b, int channel, double version)
     case Block::All: return true;
     case Block::Upto200: return channel <= 200;
     case Block::Upto100: return channel <= 100;
-    case Block::Upto66: return channel <= 66;
-    case Block::Upto32: return channel <= 32;
+    case Block::Pid66: return channel <= 66;
+    case Block::Pid32: return channel <= 32;
     case Block::Upto27: return channel <= 27;
     case Block::Upto15: return channel <= 15;
     case Block::Upto12: return channel <= 12;
@@ -128,8 +41,8 @@ bool downloadStands(Block b, int wire)
     case Block::All: return true;
     case Block::Upto200: return wire < 200;
     case Block::Upto100: return wire <= 99;
-    case Block::Upto66: return wire < 66;
-    case Block::Upto32: return wire <= 32;
+    case Block::Pid66: return wire < 66;
+    case Block::Pid32: return wire <= 32;
     case Block::Upto27: return wire < 27;
     case Block::Upto15: return wire < 15;
     case Block::Upto12: return wire < 12;
@@ -156,10 +69,10 @@ QList<RecordValue> uploadLayout(int wireChannel, double version)
     const bool pid = version >= kPidFirmware;
     int position = kFirstValuePosition;
     int infoRow = 0;
-    for (const Run& run : kRuns) {
+    for (const catalogue::RecordRun& run : catalogue::recordRuns()) {
         if (isPidBlock(run.block) && !pid) {
             // The filler holds their places; nothing is read from it.
-            if (run.block == Block::Upto66)
+            if (run.block == Block::Pid66)
                 position += kFiller.size();
             continue;
         }
@@ -168,7 +81,7 @@ QList<RecordValue> uploadLayout(int wireChannel, double version)
         const int width = run.width ? run.width : compressorTypeWidth(version);
         for (int i = 0; i < run.count; ++i) {
             RecordValue v;
-            v.field = run.firstField + i;
+            v.field = run.first + i;
             v.position = position;
             v.width = width;
             if (isPidBlock(run.block)) {
@@ -187,7 +100,7 @@ QList<RecordValue> uploadLayout(int wireChannel, double version)
 
 UncheckedRange uncheckedRange(int field)
 {
-    if (field == kPidFullOnField)
+    if (field == catalogue::kPidFullOnField)
         return {-30, 30};
     return {};
 }
@@ -252,15 +165,15 @@ QList<int> downloadFields(int wireChannel, double version)
 {
     QList<int> out;
     const bool pid = version >= kPidFirmware;
-    for (const Run& run : kRuns) {
+    for (const catalogue::RecordRun& run : catalogue::recordRuns()) {
         if (isPidBlock(run.block) && !pid)
             continue;
         if (!downloadStands(run.block, wireChannel))
             break;
         for (int i = 0; i < run.count; ++i)
-            out.append(run.firstField + i);
-        // Beyond wire 32 the record ends behind field 224.
-        if (run.block == Block::Upto66 && wireChannel > 32)
+            out.append(run.first + i);
+        // Beyond wire 32 the record ends behind the PID high full on.
+        if (run.block == Block::Pid66 && wireChannel > 32)
             break;
     }
     return out;

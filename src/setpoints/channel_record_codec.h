@@ -4,7 +4,7 @@
 // upload record that ends in "schanupload", and the comma separated download
 // record that the instrument echoes before "downcheck". Which values stand in
 // a record depends on the channel and on the firmware version; both layouts
-// are derived from one table of the values in reply order.
+// are derived from the catalogue's table of the record.
 
 #include <QList>
 #include <QString>
@@ -17,38 +17,38 @@ namespace channel_record {
 constexpr int kChannelPosition = 1;
 constexpr int kChannelWidth = 6;
 constexpr int kFirstValuePosition = 7;
-// Older firmware (below 14) has no values for fields 223..227; the record is
-// widened by this filler at position 364 so that 394 and on stay in place.
+// Older firmware (below 14) has no PID values; the record is widened by this
+// filler at position 364 so that 394 and on stay in place.
 constexpr int kFillerPosition = 364;
 inline const QString kFiller = QStringLiteral("111111222222333333444444555555");
 constexpr double kPidFirmware = 14.0;
-// Fields 223..227: no `info` row; a value within the field's fixed range is
-// kept, anything else becomes 20.
+// The PID values have no `info` row; a value within the field's fixed range
+// is kept, anything else becomes 20.
 constexpr int kUncheckedDefault = 20;
 struct UncheckedRange {
     int min = 0;
     int max = 100;
 };
-// Field 224 (function 83) is a signed offset of -3.0..3.0 oC, stored x10;
-// the others are 0..100.
+// The PID high full on is a signed offset of -3.0..3.0 oC, stored x10; the
+// others are 0..100.
 UncheckedRange uncheckedRange(int field);
 
 enum class ValueKind {
     Checked,     // tested against its `info` row by store_checked
-    Description, // field 25: six characters stored as they stand
-    Unchecked,   // fields 223..227: the fixed 0..100 rule
+    Description, // six characters stored as they stand
+    Unchecked,   // the PID values: the fixed rule of uncheckedRange()
 };
 
 struct RecordValue {
     int field = 0;    // store field of `setpoints`
-    int infoRow = -1; // row of `info` in reply order; -1 for fields 223..227
+    int infoRow = -1; // row of `info` in reply order; -1 for the PID values
     int position = 0; // first position in the (widened) upload record
     int width = 0;
     ValueKind kind = ValueKind::Checked;
 };
 
-// Width of field 165 (compressor type) in the upload record: 6 from firmware
-// 8 on and for 6.5 exactly, else 1.
+// Width of the compressor type in the upload record: 6 from firmware 8 on and
+// for 6.5 exactly, else 1.
 int compressorTypeWidth(double version);
 
 // The values that stand in the upload record of a wire channel (0..215), in

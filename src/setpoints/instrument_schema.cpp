@@ -13,10 +13,8 @@ namespace {
 
 using Type = Store::ColumnType;
 
-constexpr int kSpareField = 47;
-
 // Bank 1 starts with every temperature channel; the others are empty.
-constexpr int kChannelsInBank1 = 100;
+const int kChannelsInBank1 = catalogue::lastChannel(catalogue::Scope::Control);
 
 QString paddedDescription(int channel)
 {
@@ -214,11 +212,15 @@ QList<InfoValidationRow> infoValidationRows()
         rows.append({catalogue::fieldLabel(field), fieldDefault(field), field, l.min, l.max});
     }
     // Fields that the upload checks without a row of their own.
-    for (int field = 223; field <= 227; ++field)
-        rows.append({catalogue::fieldLabel(field), 20, field, 0, 100});
+    for (const catalogue::RecordRun& run : catalogue::recordRuns())
+        if (!catalogue::hasInfoRows(run.block))
+            for (int field = run.first; field < run.first + run.count; ++field)
+                rows.append({catalogue::fieldLabel(field), 20, field, 0, 100});
     rows.append({catalogue::fieldLabel(catalogue::kChannelNumberField), 1, catalogue::kChannelNumberField, 1, kChannels});
+    // Any number at all, as the start delay takes.
     const catalogue::Function* anyNumber = catalogue::findFunction(31);
-    rows.append({catalogue::fieldLabel(kSpareField), 0, kSpareField, anyNumber->min, anyNumber->max});
+    rows.append({catalogue::fieldLabel(catalogue::kSpareField), 0, catalogue::kSpareField, anyNumber->min,
+                 anyNumber->max});
     Q_ASSERT(rows.size() == kInfoValidationRows);
     return rows;
 }
@@ -234,7 +236,7 @@ QVariant templateSetpoint(int row, int field)
         return row < catalogue::lastChannel(catalogue::Scope::Compressor) ? channel : 0;
     case catalogue::kCondenserOrderField:
         return row < catalogue::lastChannel(catalogue::Scope::Condenser) ? channel : 0;
-    case 78: return kChannelsInBank1;
+    case catalogue::kChannelBankField: return kChannelsInBank1;
     default: return fieldDefault(field);
     }
 }

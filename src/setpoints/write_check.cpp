@@ -151,7 +151,8 @@ QString screenUnit(const catalogue::Function& f, bool bankIsTemperature, int con
     case U::Tenths: return QStringLiteral("oC");
     case U::Kpa: return QStringLiteral("KPA");
     case U::KpaOrTenths: return bankIsTemperature ? QStringLiteral("oC") : QStringLiteral("KPA");
-    case U::SecondsOrTenths: return controlType == 7 ? QStringLiteral("oC") : QStringLiteral("seconds");
+    case U::SecondsOrTenths:
+        return controlType == catalogue::kSuperHeatControlKind ? QStringLiteral("oC") : QStringLiteral("seconds");
     case U::Minutes: return QStringLiteral("minutes");
     case U::Seconds: return QStringLiteral("seconds");
     case U::Percent: return QStringLiteral("%");

@@ -86,9 +86,6 @@ int checkBoxOf(int function, int subfunction)
 namespace {
 
 constexpr int kEchoWaitMs = 1000;
-constexpr int kPidControlType = 7;
-constexpr int kBankTypeField = 218;   // function 82, by bank
-constexpr int kControlTypeField = 209; // function 112
 constexpr int kBlankTime = 600;
 constexpr int kChannelsInBank = 1;
 constexpr int kCompressorsInBank = 22;
@@ -258,8 +255,8 @@ std::optional<WritePath::Write> WritePath::compose(int function, int channel, in
     w.oldValue = storedText(w.storeRow, field);
     const bool bankIsTemperature =
         f->unit == catalogue::Unit::KpaOrTenths
-        && m_store.setpoint(0, kBankTypeField + subfunction).toInt() == 1;
-    const int controlType = m_store.setpoint(wire, kControlTypeField).toInt();
+        && m_store.setpoint(0, catalogue::kBankKindField + subfunction).toInt() == 1;
+    const int controlType = m_store.setpoint(wire, catalogue::kControlKindField).toInt();
     const catalogue::ScreenForm form = catalogue::screenForm(*f, bankIsTemperature, controlType);
     const QString notNumber = QStringLiteral("Not a valid number, Enter a valid number");
     QStringList values;
@@ -356,8 +353,8 @@ write_check::Context write_command::checkContextOf(InstrumentStore& store, int f
     if (!f || channel < 1 || channel > catalogue::kChannels)
         return c;
     c.bankIsTemperature = f->unit == catalogue::Unit::KpaOrTenths
-                          && store.setpoint(0, kBankTypeField + subfunction).toInt() == 1;
-    c.controlType = store.setpoint(channel - 1, kControlTypeField).toInt();
+                          && store.setpoint(0, catalogue::kBankKindField + subfunction).toInt() == 1;
+    c.controlType = store.setpoint(channel - 1, catalogue::kControlKindField).toInt();
     if (f->unit == catalogue::Unit::TimeOfDay) {
         auto timeAt = [&](int sub) -> std::optional<int> {
             if (sub < 0 || sub >= f->group)

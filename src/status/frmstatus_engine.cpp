@@ -13,11 +13,7 @@
 
 namespace {
 
-constexpr int kAssocFirstField = 26;    // 26..28
-constexpr int kControlKindField = 209;
-constexpr int kBankSizeFirstField = 78; // 78..82, row 0
-constexpr int kGroupsField = 83;
-constexpr int kBanks = 5;
+using catalogue::kBanks;
 constexpr int kLastOutputChannel = 100;
 
 const QString kUnknown = QStringLiteral("????");
@@ -91,12 +87,12 @@ bool frmstatus_engine::Form_Load(const QString& instrumentId, const QString& sto
         c.number = sp.value(catalogue::kChannelTextField).toString();
         c.description = sp.value(catalogue::kDescriptionField).toString();
         for (int j = 0; j < 3; ++j)
-            c.assoc[j] = number(sp.value(kAssocFirstField + j));
-        c.kind = number(sp.value(kControlKindField));
+            c.assoc[j] = number(sp.value(catalogue::kAssociatedChannelField + j));
+        c.kind = number(sp.value(catalogue::kControlKindField));
         if (n == 1) {
             for (int b = 0; b < kBanks; ++b)
-                m_bankSize[b] = number(sp.value(kBankSizeFirstField + b));
-            m_groups = number(sp.value(kGroupsField));
+                m_bankSize[b] = number(sp.value(catalogue::kChannelBankField + b));
+            m_banksInUse = number(sp.value(catalogue::kBanksInUseField));
         }
     }
     if (keep >= 0)
@@ -184,7 +180,7 @@ void frmstatus_engine::redoBanks()
     if (!m_store)
         return;
     for (int b = 0; b < kBanks; ++b)
-        m_bankSize[b] = number(m_store->setpoint(0, kBankSizeFirstField + b));
+        m_bankSize[b] = number(m_store->setpoint(0, catalogue::kChannelBankField + b));
     chanBanks();
 }
 
@@ -212,7 +208,7 @@ void frmstatus_engine::chanBanks()
         s.visible = false;
     suc[15].visible = true;
     int limit;
-    switch (m_groups) {
+    switch (m_banksInUse) {
     case 1: limit = 2; break;
     case 2: limit = 5; break;
     case 3: limit = 8; break;
@@ -222,7 +218,7 @@ void frmstatus_engine::chanBanks()
     }
     for (int i = 0; i <= limit && i < Suctions; ++i)
         suc[i].visible = true;
-    for (int k = 0; k < qMin(m_groups, Pressures); ++k) {
+    for (int k = 0; k < qMin(m_banksInUse, Pressures); ++k) {
         TempPLabel[k].visible = true;
         TempP[k].visible = true;
     }

@@ -106,5 +106,5 @@ private:
     };
     std::vector<ChannelConfig> m_config;
     int m_bankSize[5] = {};
-    int m_groups = 0;
+    int m_banksInUse = 0;
 };

@@ -4,17 +4,19 @@
 #include "link/link.h"
 #include "link/link_globals.h"
 #include "platform/operator.h"
+#include "setpoints/catalogue.h"
 #include "setpoints/instrument_store.h"
 #include "setpoints/view_store.h"
 
 namespace {
 
-constexpr int kCompressorBankField = 155; // 155..159, row 0
-constexpr int kCondenserBankField = 160;  // 160..164, row 0
-constexpr int kBanksInUseField = 83;
-constexpr int kCompressorKindField = 165;
-constexpr int kEqualizerField = 167;
-constexpr int kCondenserKindField = 169;
+using catalogue::kBanksInUseField;
+using catalogue::kCompressorBankField; // row 0, one for each bank
+using catalogue::kCompressorKindField;
+using catalogue::kCondenserBankField; // row 0, one for each bank
+using catalogue::kCondenserKindField;
+using catalogue::kEqualizerField;
+
 const QString kUnknown = QStringLiteral("????");
 
 int number(const QVariant& v)
