@@ -5,7 +5,6 @@
 #include "platform/operator.h"
 #include "setpoints/audit_trail.h"
 #include "setpoints/catalogue.h"
-#include "setpoints/channel_sources.h"
 #include "setpoints/channels_transfer_engine.h"
 #include "setpoints/upload_progress_engine.h"
 
@@ -16,8 +15,6 @@ class TestChannelSources : public QObject {
 private slots:
     void init();
     void cleanup();
-    void channelRuns_data();
-    void channelRuns();
     void onlyUploadsAndConfirmedEditsFillAChannel_data();
     void onlyUploadsAndConfirmedEditsFillAChannel();
     void marksOutlastTheProgram();
@@ -83,23 +80,6 @@ void TestChannelSources::edit(int function, int channel, const QString& value, b
     m_link->buffer = confirmed ? m_engine->writer.sent_to_glacinor : QStringLiteral("garbled sret");
     m_engine->writer.ret_handel();
     m_clock->advance(60000);
-}
-
-void TestChannelSources::channelRuns_data()
-{
-    QTest::addColumn<QList<int>>("channels");
-    QTest::addColumn<QString>("text");
-    QTest::newRow("one") << QList<int>{7} << "7";
-    QTest::newRow("two apart") << QList<int>{1, 3} << "1, 3";
-    QTest::newRow("a pair is a run") << QList<int>{4, 5} << "4-5";
-    QTest::newRow("runs and singles") << QList<int>{1, 2, 3, 60, 62, 63, 216} << "1-3, 60, 62-63, 216";
-}
-
-void TestChannelSources::channelRuns()
-{
-    QFETCH(QList<int>, channels);
-    QFETCH(QString, text);
-    QCOMPARE(ChannelSources::channelRuns(channels), text);
 }
 
 void TestChannelSources::onlyUploadsAndConfirmedEditsFillAChannel_data()
